@@ -1,0 +1,29 @@
+// The fault plan: the one seam through which tests make platform operations fail or end the
+// process mid-run. Nothing outside the tests sets it; with no plan set every check passes.
+#pragma once
+#include <cstdint>
+#include <functional>
+
+namespace plat::fault {
+
+enum class Op { Copy, Remove, Write, Rename, RegWrite, ProcessStart, Any };
+
+// The nth (1-based) operation of the kind (Any: of every kind) fails with the code; with
+// persistent, that operation and every later one of the kind fails.
+void FailNth(Op op, int n, std::uint32_t code, bool persistent = false);
+
+// The process ends (_exit, no clean-up, as a power cut would) just before its nth mutating
+// operation (copy, delete, write, rename, attribute or time change, registry write).
+void CrashAtMutation(int n);
+
+// Removes every rule and resets the counters.
+void Clear();
+
+// Called by the platform before an operation: counts it, ends the process if a crash rule
+// says so, and returns false with the last error set when the operation must fail.
+bool Allow(Op op);
+
+// Mutating operations counted since the last Clear (for the crash-point tests).
+int MutationCount();
+
+}  // namespace plat::fault

@@ -1,0 +1,27 @@
+// A fresh emulated machine for one test: a new machine root in a temporary host folder,
+// removed again when the test ends.
+#pragma once
+#include <string>
+
+namespace pextest {
+
+class TestMachine {
+public:
+    TestMachine();   // creates the root, points the platform at it, current directory C:\ .
+    ~TestMachine();  // removes the root folder and everything in it
+    TestMachine(const TestMachine&) = delete;
+    TestMachine& operator=(const TestMachine&) = delete;
+
+    const std::string& Root() const { return root_; }
+    // Host path of drive C: (root/drive_c).
+    std::string DriveC() const { return root_ + "/drive_c"; }
+    // Writes a file by Windows path (creating its folders) with the given bytes.
+    void WriteFile(const std::string& winPath, const std::string& bytes) const;
+    // Reads a file by Windows path; empty when missing.
+    std::string ReadFile(const std::string& winPath) const;
+
+private:
+    std::string root_;
+};
+
+}  // namespace pextest
