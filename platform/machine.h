@@ -23,4 +23,9 @@ void SetRoot(const std::string& hostDir);
 // last error when the root cannot be made.
 bool Ensure();
 
+// Registers a function that SetRoot calls before it switches to another root, so that state
+// kept for the old root (the open registry database) is released. Registering the same
+// function again has no effect.
+void OnRootChange(void (*callback)());
+
 }  // namespace plat::machine
