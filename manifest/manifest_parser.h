@@ -1,0 +1,83 @@
+// CManifestParser: processes one product: its settings, its content file, the analysis of the
+// rows and the apply pipeline. Exported to hosts, which may drive it for a single product.
+#pragma once
+#include <cstdint>
+#include <set>
+#include <string>
+
+#include "commands/platform_utilities.h"
+#include "entry/mendler_api.h"
+#include "entry/progress_data.h"
+#include "manifest/content_table.h"
+#include "platform/bstr.h"
+
+class MENDLER_API CManifestParser {
+public:
+    CManifestParser();
+    ~CManifestParser();
+    CManifestParser(const CManifestParser&) = delete;
+    CManifestParser& operator=(const CManifestParser&) = delete;
+
+    // Processes the product; the number of failures, 0 for complete success or nothing to do.
+    std::int32_t ProcessUpdateInformation(_bstr_t project, ProgressCallback callback);
+    // Adds a file name, trimmed and upper-cased, to the special-file list.
+    void AddToSpecialList(std::string name);
+    // Empties the special-file list and clears the special-file-attempted flag.
+    void ClearSpecialFileList();
+    bool WasSpecialFileUpdateAttempted() const { return specialFileAttempted_; }
+
+    // --- product settings ---
+    bool Init(std::string project);
+    std::string DefaultPath() const;
+    void ParseSiteString(std::string* site, std::string* path) const;
+    static std::string sGetSiteSpecificInfo(const std::string& site, const std::string& item,
+                                            const std::string& dflt);
+    static std::string UBranch(const std::string& site);
+    static std::string sResolveDirectoryInformation(const std::string& home,
+                                                    const std::string& dflt);
+    static std::string sGetTempFileName() { return ::sGetTempFileName(); }
+
+    // --- content file ---
+    bool LoadManifest(const std::string& project, bool* present);
+    bool WriteManifest();
+    void ResetCursor() { cursor_ = -1; }
+    bool NextRow();
+    bool MoveToRow(std::int32_t index);
+    std::string GetField(const std::string& column) const;
+    bool SetField(std::int32_t row, const std::string& column, const std::string& value);
+    bool DiscardContentFile();
+
+    // Read access for tests and tools.
+    const CContentTable& Table() const { return table_; }
+    CContentTable& Table() { return table_; }
+    const std::string& DefaultDirectory() const { return defaultDirectory_; }
+    std::int32_t PromptThreshold() const { return promptThreshold_; }
+    const std::string& Site() const { return site_; }
+    const std::string& FtpPath() const { return ftpPath_; }
+    const std::string& PBranch() const { return pBranch_; }
+    const std::string& UBranchSetting() const { return uBranch_; }
+    const std::string& GetScript() const { return getScript_; }
+    bool MandatoryOnly() const { return mandatoryOnly_; }
+    const std::string& ContentFilePath() const { return contentFilePath_; }
+    const std::string& ContentFileTarget() const { return contentFileTarget_; }
+
+private:
+    // Records whether the normalised name is in the special-file list.
+    void TestSpecialFile(const std::string& fileName);
+
+    std::set<std::string> specialFiles_;
+    bool specialFileAttempted_ = false;
+    CProfile profile_;
+
+    std::string projectSection_;
+    std::string defaultDirectory_;
+    std::int32_t promptThreshold_ = 0;
+    std::string defaultContentFile_;
+    std::string site_, ftpPath_, pBranch_, uBranch_, getScript_;
+
+    CContentTable table_;
+    std::int32_t cursor_ = -1;
+    std::string contentFilePath_;
+    bool mandatoryOnly_ = false;
+    std::string contentFileTarget_;
+};
