@@ -1,5 +1,17 @@
 // The content table: the in-memory form of a product's content file, a comma-separated text
 // table with one header line of column names and one line per update file.
+//
+// File format read and written here:
+// - Lines end in CR LF, LF or CR; the last line may lack its end. Reading stops at the first
+//   empty line, whatever its line end, or at the end of the bytes.
+// - A line is cut at every separator; quotes protect nothing. A separator at the very end of a
+//   line gives no extra cell.
+// - Row cells are unquoted: a cell of two or more characters is trimmed of white space; nothing
+//   left gives an empty cell, a trimmed text between double quotes gives the text inside them;
+//   otherwise the cell is exactly its text. Header names are taken as written.
+// - A short row is filled up with empty cells; a row longer than the header fails the load.
+// - Writing joins names and cells with the separator, without quotes or escaping, and ends
+//   every line with CR LF.
 #pragma once
 #include <cstdint>
 #include <string>
@@ -16,18 +28,21 @@ public:
     // E_FAIL for a format error, otherwise an HRESULT made from the open's Windows error.
     // On failure the table is not usable.
     std::int32_t LoadFromFile(const std::string& path, bool header = true, char separator = ',');
-    // Loads from bytes already read (the same rules as LoadFromFile).
+    // Loads from bytes already read (the same rules as LoadFromFile). Without header the first
+    // line is a row like the others; it sets the column count and the columns have empty names.
+    // On failure the table is left empty (no columns, no rows).
     std::int32_t LoadFromText(const std::string& bytes, bool header = true, char separator = ',');
 
     // Writes the table durably (temporary file beside, flush, rename). 0 when the table has
     // columns, 1 when it has none. Throws plat::CFileException when the file cannot be written;
     // the old file then stays as it was.
     std::int32_t SaveToFile(const std::string& path, bool header = true, char separator = ',') const;
-    // The bytes SaveToFile writes.
+    // The bytes SaveToFile writes (with the header line).
     std::string ToFileText(char separator = ',') const;
 
     // Index of the first column whose name equals name without regard to case; -1 when none.
     int ColumnIndex(const std::string& name) const;
+    // The name of a column; empty text for an index outside the table.
     const std::string& ColumnName(std::uint32_t index) const;
     std::uint32_t ColumnCount() const { return columnCount_; }
     std::uint32_t RowCount() const;
@@ -37,12 +52,25 @@ public:
     const std::string& Cell(std::uint32_t row, std::uint32_t column) const;
     bool SetCell(std::uint32_t row, std::uint32_t column, const std::string& value);
 
-    // The diagnostic rendering for the trace log.
+    // Cell access by column name (ColumnIndex); a missing column reads as empty text and
+    // takes no write.
+    const std::string& Field(std::uint32_t row, const std::string& columnName) const;
+    bool SetField(std::uint32_t row, const std::string& columnName, const std::string& value);
+
+    // Removes every column and row.
+    void Clear();
+
+    // The diagnostic rendering for the trace log: a line feed, the header line (the key
+    // column's name followed by "(KEY)"), then one line per row; every entry left-aligned and
+    // padded with blanks to its column's width plus one; every line ends with a line feed.
     std::string ToText() const;
 
     std::uint32_t keyColumn = 0;
 
 private:
+    std::int32_t ParseRows(const std::string& bytes, std::size_t pos, char separator);
+    std::string Render(bool header, char separator) const;
+
     std::vector<std::string> columns_;
     std::uint32_t columnCount_ = 0;
     std::vector<std::string> cells_;
