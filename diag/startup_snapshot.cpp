@@ -52,9 +52,8 @@ void LogRegistryKey(const std::string& entry) {
 }  // namespace
 
 void LogComponentVersions() {
-    const std::string base = AddTrailingBackslash(
-        plat::paths::SplitPath(plat::files::ModuleFileName(nullptr)).drive +
-        plat::paths::SplitPath(plat::files::ModuleFileName(nullptr)).dir);
+    const plat::paths::PathParts host = plat::paths::SplitPath(plat::files::ModuleFileName(nullptr));
+    const std::string base = AddTrailingBackslash(host.drive + host.dir);
     g_TraceLog.keepOpen = true;
     for (const SuiteComponent& c : SuiteComponentList()) {
         if (c.kind == SuiteComponent::File) {
