@@ -8,13 +8,16 @@ namespace plat::fault {
 
 enum class Op { Copy, Remove, Write, Rename, RegWrite, ProcessStart, Any };
 
-// The nth (1-based) operation of the kind (Any: of every kind) fails with the code; with
-// persistent, that operation and every later one of the kind fails.
+// The nth (1-based) operation of the kind (Any: of every kind), counted from when the rule is
+// set, fails with the code; with persistent, that operation and every later one of the kind
+// fails.
 void FailNth(Op op, int n, std::uint32_t code, bool persistent = false);
 
 // The process ends (_exit, no clean-up, as a power cut would) just before its nth mutating
-// operation (copy, delete, write, rename, attribute or time change, registry write).
+// operation (copy, delete, write, rename, attribute or time change, registry write), counted
+// since the last Clear. The exit status is kCrashExitCode.
 void CrashAtMutation(int n);
+constexpr int kCrashExitCode = 86;
 
 // Removes every rule and resets the counters.
 void Clear();

@@ -1,0 +1,87 @@
+// The fault plan: counted rules that make platform operations fail or end the process.
+#include "platform/fault.h"
+
+#include <cstdlib>
+#include <mutex>
+#include <vector>
+
+#include "platform/errors.h"
+
+namespace plat::fault {
+
+namespace {
+
+struct Rule {
+    Op op;
+    int n;
+    std::uint32_t code;
+    bool persistent;
+    int seen = 0;
+};
+
+struct Plan {
+    std::mutex lock;
+    std::vector<Rule> rules;
+    int mutations = 0;
+    int crashAt = 0;  // 0: no crash planned
+};
+
+Plan& ThePlan() {
+    static Plan plan;
+    return plan;
+}
+
+bool IsMutating(Op op) {
+    return op == Op::Copy || op == Op::Remove || op == Op::Write || op == Op::Rename ||
+           op == Op::RegWrite;
+}
+
+}  // namespace
+
+void FailNth(Op op, int n, std::uint32_t code, bool persistent) {
+    Plan& plan = ThePlan();
+    std::lock_guard<std::mutex> hold(plan.lock);
+    plan.rules.push_back(Rule{op, n, code, persistent});
+}
+
+void CrashAtMutation(int n) {
+    Plan& plan = ThePlan();
+    std::lock_guard<std::mutex> hold(plan.lock);
+    plan.crashAt = n;
+}
+
+void Clear() {
+    Plan& plan = ThePlan();
+    std::lock_guard<std::mutex> hold(plan.lock);
+    plan.rules.clear();
+    plan.mutations = 0;
+    plan.crashAt = 0;
+}
+
+bool Allow(Op op) {
+    Plan& plan = ThePlan();
+    std::lock_guard<std::mutex> hold(plan.lock);
+    if (IsMutating(op) && ++plan.mutations == plan.crashAt) {
+        // A power cut: no destructors, no buffered output, no clean-up of any kind.
+        std::_Exit(kCrashExitCode);
+    }
+    bool allowed = true;
+    for (Rule& rule : plan.rules) {
+        if (rule.op != op && rule.op != Op::Any) continue;
+        ++rule.seen;
+        // Every matching rule counts the operation, even when an earlier rule already failed it.
+        if (allowed && (rule.seen == rule.n || (rule.persistent && rule.seen > rule.n))) {
+            SetLastErrorCode(rule.code);
+            allowed = false;
+        }
+    }
+    return allowed;
+}
+
+int MutationCount() {
+    Plan& plan = ThePlan();
+    std::lock_guard<std::mutex> hold(plan.lock);
+    return plan.mutations;
+}
+
+}  // namespace plat::fault
