@@ -1,0 +1,91 @@
+/* The grammar of dynamic-field texts: assignments to settings, separated by ";", whose right
+   sides are expressions over literals, variables, calls and the infix operators. Each rule's
+   action builds the COverrideExpression node of its left side. */
+
+%code requires {
+#include "expr/override_expression.h"
+/* Declared here rather than with api.value.type, which would mark the type trivial and let the
+   parser relocate its stacks bytewise. */
+#define PEXEXPRSTYPE COverrideExpression
+}
+
+%code provides {
+int pexexprlex();
+}
+
+%{
+#include <cstdio>
+#include <cstring>
+
+#include "expr/expression_tree.h"
+
+/* Fixed stacks of 200 entries, never grown. */
+#define YYINITDEPTH 200
+#define YYMAXDEPTH 200
+
+/* Bison calls an exhausted stack "memory exhausted"; with stacks that never grow that can only
+   be a stack overflow, reported under its own name. */
+#define YY_(msg) (std::strcmp((msg), "memory exhausted") == 0 ? "parser stack overflow" : (msg))
+
+static void pexexprerror(const char* message) { std::printf("%s\n", message); }
+%}
+
+%define api.prefix {pexexpr}
+
+%token TOK_OVERRIDE_SEP TOK_EQUAL TOK_VAR TOK_SETTING TOK_PAREN_L TOK_PAREN_R TOK_COMMA
+%token TOK_STRING TOK_FUNCTION_NAME TOK_NUMBER TOK_CONCAT TOK_TRUE TOK_FALSE
+%token TOK_BOOL_OR TOK_BOOL_XOR TOK_BOOL_AND TOK_BOOL_NOT
+
+%left TOK_CONCAT
+%left TOK_BOOL_OR
+%left TOK_BOOL_XOR
+%left TOK_BOOL_AND
+%precedence TOK_BOOL_NOT
+
+%start override_string
+
+%%
+
+override_string
+    : override
+    | override_string TOK_OVERRIDE_SEP override
+    ;
+
+override
+    : TOK_SETTING TOK_EQUAL expression              { $$ = MakeAssignment($1, $3); }
+    ;
+
+expression
+    : term
+    | expression TOK_BOOL_AND expression            { $$ = MakeCall("AND", $1, $3); }
+    | expression TOK_BOOL_OR expression             { $$ = MakeCall("OR", $1, $3); }
+    | expression TOK_BOOL_XOR expression            { $$ = MakeCall("XOR", $1, $3); }
+    | expression TOK_CONCAT expression              { $$ = MakeCall("CONCAT", $1, $3); }
+    ;
+
+term
+    : TOK_VAR                                       { $$ = CreateVariable($1.stringValue); }
+    | TOK_SETTING                                   { $$ = CreateVariable($1.stringValue); }
+    | function
+    | TOK_TRUE
+    | TOK_FALSE
+    | TOK_NUMBER
+    | TOK_STRING
+    | TOK_BOOL_NOT expression                       { $$ = MakeCall("NOT", $2); }
+    | TOK_PAREN_L expression TOK_PAREN_R            { $$ = $2; }
+    ;
+
+function
+    : TOK_FUNCTION_NAME TOK_PAREN_L params TOK_PAREN_R  { $$ = AttachParameters($1, $3); }
+    ;
+
+params
+    : parameter                     { $$ = COverrideExpression::ParamList(); AddParameter($$, $1); }
+    | params TOK_COMMA parameter    { $$ = AddParameter($1, $3); }
+    ;
+
+parameter
+    : expression
+    ;
+
+%%
