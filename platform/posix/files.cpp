@@ -462,7 +462,13 @@ std::vector<FindEntry> Find(const std::string& pattern) {
 std::string ModuleFileName(const void* addressInModule) {
     std::string host;
     Dl_info info{};
-    if (addressInModule && dladdr(addressInModule, &info) && info.dli_fname) host = info.dli_fname;
+    if (addressInModule) {
+        if (!dladdr(addressInModule, &info) || !info.dli_fname) {
+            SetLastErrorCode(kErrorModNotFound);
+            return std::string();
+        }
+        host = info.dli_fname;
+    }
     // The program itself is reported by the name it was started with; /proc knows its file.
     if (host.empty() || host.find('/') == std::string::npos || host == program_invocation_name) {
         host = SelfExecutable();

@@ -1,0 +1,243 @@
+// Files and folders by Windows path, with the Windows answers for read-only, in-use and missing
+// files.
+#include "platform/files.h"
+
+#include <gtest/gtest.h>
+#include <signal.h>
+#include <sys/file.h>
+#include <sys/resource.h>
+#include <sys/wait.h>
+#include <fcntl.h>
+#include <unistd.h>
+
+#include <filesystem>
+#include <regex>
+
+#include "platform/errors.h"
+#include "platform/fault.h"
+#include "platform/paths.h"
+#include "tests/support/test_machine.h"
+
+namespace {
+
+namespace files = plat::files;
+namespace fs = std::filesystem;
+
+// 2003-12-31 22:30:00 UTC as a FILETIME.
+constexpr files::FileTime kSomeTime = 127173834000000000ULL;
+
+class Files : public ::testing::Test {
+protected:
+    void SetUp() override {
+        plat::fault::Clear();
+        m.WriteFile("C:\\app\\src.txt", "new content");
+        m.WriteFile("C:\\app\\dst.txt", "old content");
+    }
+    void TearDown() override { plat::fault::Clear(); }
+
+    // Expects the call to fail with the Windows code.
+    static void ExpectFails(bool result, std::uint32_t code) {
+        EXPECT_FALSE(result);
+        EXPECT_EQ(plat::LastError(), code);
+    }
+    std::vector<std::string> Leftovers() const {
+        std::vector<std::string> names;
+        for (const auto& e : fs::directory_iterator(m.DriveC() + "/app")) {
+            names.push_back(e.path().filename().string());
+        }
+        return names;
+    }
+
+    pextest::TestMachine m;
+};
+
+TEST_F(Files, CopyReplacesTheTargetAndKeepsTheSourceWriteTime) {
+    ASSERT_TRUE(files::SetTimes("C:\\app\\src.txt", 0, 0, kSomeTime));
+    ASSERT_TRUE(files::Copy("C:\\APP\\SRC.TXT", "C:\\app\\DST.txt", false));
+    EXPECT_EQ(m.ReadFile("C:\\app\\dst.txt"), "new content");
+    files::FileStatus st;
+    ASSERT_TRUE(files::GetStatus("C:\\app\\dst.txt", &st));
+    EXPECT_EQ(st.lastWrite, kSomeTime);
+    EXPECT_EQ(st.size, 11u);
+    EXPECT_EQ(Leftovers().size(), 2u);
+}
+
+TEST_F(Files, CopyReportsExistingTargetsAndMissingNames) {
+    ExpectFails(files::Copy("C:\\app\\src.txt", "C:\\app\\dst.txt", true), plat::kErrorFileExists);
+    EXPECT_EQ(m.ReadFile("C:\\app\\dst.txt"), "old content");
+    ExpectFails(files::Copy("C:\\app\\none.txt", "C:\\app\\x.txt", false), plat::kErrorFileNotFound);
+    ExpectFails(files::Copy("C:\\none\\a.txt", "C:\\app\\x.txt", false), plat::kErrorPathNotFound);
+    ExpectFails(files::Copy("C:\\app\\src.txt", "C:\\none\\x.txt", false), plat::kErrorPathNotFound);
+    ExpectFails(files::Copy("C:\\app\\src.txt", "C:\\app\\src.txt", false), plat::kErrorSharingViolation);
+}
+
+TEST_F(Files, ReadOnlyFilesRefuseOverwriteDeleteAndReplace) {
+    ASSERT_TRUE(files::SetAttributes("C:\\app\\dst.txt", files::kAttrReadOnly));
+    EXPECT_EQ(files::GetAttributes("C:\\app\\dst.txt"), files::kAttrReadOnly);
+    ExpectFails(files::Copy("C:\\app\\src.txt", "C:\\app\\dst.txt", false), plat::kErrorAccessDenied);
+    ExpectFails(files::Remove("C:\\app\\dst.txt"), plat::kErrorAccessDenied);
+    ExpectFails(files::Rename("C:\\app\\src.txt", "C:\\app\\dst.txt", true), plat::kErrorAccessDenied);
+    ExpectFails(files::WriteAllDurably("C:\\app\\dst.txt", "x"), plat::kErrorAccessDenied);
+    EXPECT_EQ(m.ReadFile("C:\\app\\dst.txt"), "old content");
+
+    ASSERT_TRUE(files::SetAttributes("C:\\app\\dst.txt", files::kAttrNormal));
+    EXPECT_EQ(files::GetAttributes("C:\\app\\dst.txt"), files::kAttrNormal);
+    EXPECT_TRUE(files::Remove("C:\\app\\dst.txt"));
+}
+
+TEST_F(Files, AFileLockedByAnotherOpenerIsInUse) {
+    const int fd = open(plat::paths::ToHost("C:\\app\\dst.txt").c_str(), O_RDONLY);
+    ASSERT_EQ(flock(fd, LOCK_EX), 0);
+    ExpectFails(files::Copy("C:\\app\\src.txt", "C:\\app\\dst.txt", false), plat::kErrorSharingViolation);
+    ExpectFails(files::Remove("C:\\app\\dst.txt"), plat::kErrorSharingViolation);
+    std::string bytes;
+    ExpectFails(files::ReadAll("C:\\app\\dst.txt", &bytes), plat::kErrorSharingViolation);
+    close(fd);
+    EXPECT_TRUE(files::Copy("C:\\app\\src.txt", "C:\\app\\dst.txt", false));
+}
+
+TEST_F(Files, ARunningProgramIsInUse) {
+    fs::copy_file("/bin/cat", m.DriveC() + "/app/cat.exe");
+    const std::string program = m.DriveC() + "/app/cat.exe";
+    int input[2], started[2];
+    ASSERT_EQ(pipe(input), 0);
+    ASSERT_EQ(pipe2(started, O_CLOEXEC), 0);
+    const pid_t child = fork();
+    if (child == 0) {
+        dup2(input[0], 0);
+        close(input[1]);
+        execl(program.c_str(), "cat", static_cast<char*>(nullptr));
+        _exit(127);
+    }
+    close(input[0]);
+    close(started[1]);
+    char c;
+    ASSERT_EQ(read(started[0], &c, 1), 0);  // the pipe closes when the program runs
+    ExpectFails(files::Copy("C:\\app\\src.txt", "C:\\app\\cat.exe", false), plat::kErrorSharingViolation);
+    ExpectFails(files::Remove("C:\\app\\cat.exe"), plat::kErrorSharingViolation);
+    close(input[1]);
+    int status = 0;
+    waitpid(child, &status, 0);
+    close(started[0]);
+    EXPECT_TRUE(files::Remove("C:\\app\\cat.exe"));
+}
+
+TEST_F(Files, AFailedCopyLeavesTheTargetWhole) {
+    plat::fault::FailNth(plat::fault::Op::Copy, 1, plat::kErrorDiskFull);
+    ExpectFails(files::Copy("C:\\app\\src.txt", "C:\\app\\dst.txt", false), plat::kErrorDiskFull);
+    EXPECT_EQ(m.ReadFile("C:\\app\\dst.txt"), "old content");
+
+    // A real write failure half way: the file size limit stops the temporary file.
+    m.WriteFile("C:\\app\\big.bin", std::string(1 << 20, 'b'));
+    struct rlimit saved;
+    getrlimit(RLIMIT_FSIZE, &saved);
+    struct rlimit small = saved;
+    small.rlim_cur = 4096;
+    const auto oldHandler = signal(SIGXFSZ, SIG_IGN);
+    setrlimit(RLIMIT_FSIZE, &small);
+    const bool copied = files::Copy("C:\\app\\big.bin", "C:\\app\\dst.txt", false);
+    const std::uint32_t code = plat::LastError();
+    setrlimit(RLIMIT_FSIZE, &saved);
+    signal(SIGXFSZ, oldHandler);
+    EXPECT_FALSE(copied);
+    EXPECT_EQ(code, plat::kErrorDiskFull);
+    EXPECT_EQ(m.ReadFile("C:\\app\\dst.txt"), "old content");
+    EXPECT_EQ(Leftovers().size(), 3u);
+}
+
+TEST_F(Files, RenameAndRemoveGiveTheWindowsCodes) {
+    ExpectFails(files::Rename("C:\\app\\src.txt", "C:\\app\\dst.txt", false), plat::kErrorAlreadyExists);
+    ASSERT_TRUE(files::Rename("C:\\app\\src.txt", "C:\\app\\dst.txt", true));
+    EXPECT_EQ(m.ReadFile("C:\\app\\dst.txt"), "new content");
+    ExpectFails(files::Rename("C:\\app\\src.txt", "C:\\app\\x.txt", false), plat::kErrorFileNotFound);
+    ExpectFails(files::Rename("C:\\app\\dst.txt", "C:\\no\\x.txt", false), plat::kErrorPathNotFound);
+
+    ExpectFails(files::Remove("C:\\app\\src.txt"), plat::kErrorFileNotFound);
+    ExpectFails(files::Remove("C:\\none\\src.txt"), plat::kErrorPathNotFound);
+    ExpectFails(files::Remove("C:\\app"), plat::kErrorAccessDenied);
+    EXPECT_EQ(files::GetAttributes("C:\\app\\src.txt"), files::kInvalidAttributes);
+    EXPECT_EQ(plat::LastError(), plat::kErrorFileNotFound);
+}
+
+TEST_F(Files, FoldersAreMadeOnceAndRemovedWhenEmpty) {
+    ExpectFails(files::MakeDirectory("C:\\APP"), plat::kErrorAlreadyExists);
+    ExpectFails(files::MakeDirectory("C:\\a\\b"), plat::kErrorPathNotFound);
+    ASSERT_TRUE(files::MakeDirectory("C:\\a"));
+    EXPECT_EQ(files::GetAttributes("C:\\A"), files::kAttrDirectory);
+    ExpectFails(files::RemoveDirectory("C:\\app"), plat::kErrorDirNotEmpty);
+    EXPECT_TRUE(files::RemoveDirectory("C:\\a"));
+    EXPECT_FALSE(files::Exists("C:\\a"));
+}
+
+TEST_F(Files, TimesSetToZeroStayAsTheyWere) {
+    ASSERT_TRUE(files::SetTimes("C:\\app\\dst.txt", kSomeTime, kSomeTime, kSomeTime));
+    ASSERT_TRUE(files::SetTimes("C:\\app\\dst.txt", 0, kSomeTime + 10000000, 0));
+    files::FileStatus st;
+    ASSERT_TRUE(files::GetStatus("C:\\app\\dst.txt", &st));
+    EXPECT_EQ(st.creation, kSomeTime);
+    EXPECT_EQ(st.lastAccess, kSomeTime + 10000000);
+    EXPECT_EQ(st.lastWrite, kSomeTime);
+    ExpectFails(files::SetTimes("C:\\app\\none", 1, 1, 1), plat::kErrorFileNotFound);
+}
+
+TEST_F(Files, TempFileNamesAreNewEmptyFiles) {
+    EXPECT_EQ(files::TempFolder(), "C:\\windows\\temp\\");
+    const std::string a = files::TempFileName(files::TempFolder(), "pexium");
+    const std::string b = files::TempFileName("C:\\windows\\temp", "pex");
+    EXPECT_TRUE(std::regex_match(a, std::regex(R"(C:\\windows\\temp\\pex[0-9a-f]{4}\.tmp)"))) << a;
+    EXPECT_NE(a, b);
+    std::string bytes = "x";
+    ASSERT_TRUE(files::ReadAll(a, &bytes));
+    EXPECT_EQ(bytes, "");
+    EXPECT_EQ(files::TempFileName("C:\\app", "ab", 0x2f), "C:\\app\\ab002f.tmp");
+    EXPECT_FALSE(files::Exists("C:\\app\\ab002f.tmp"));
+    EXPECT_EQ(files::TempFileName("C:\\none", "pex"), "");
+    EXPECT_EQ(plat::LastError(), plat::kErrorPathNotFound);
+}
+
+TEST_F(Files, FindMatchesWildcardsWithoutRegardToCase) {
+    m.WriteFile("C:\\app\\noext", "");
+    fs::create_directory(m.DriveC() + "/app/Sub");
+    auto names = [](const std::string& pattern) {
+        std::string out;
+        for (const auto& e : files::Find(pattern)) out += e.name + " ";
+        return out;
+    };
+    EXPECT_EQ(names("C:\\app\\*.TXT"), "dst.txt src.txt ");
+    EXPECT_EQ(names("C:\\APP\\s?c.txt"), "src.txt ");
+    EXPECT_EQ(names("C:\\app\\SRC.TXT"), "src.txt ");
+    EXPECT_EQ(names("C:\\app\\*.*"), "dst.txt noext src.txt Sub ");
+    const auto sub = files::Find("C:\\app\\sub");
+    ASSERT_EQ(sub.size(), 1u);
+    EXPECT_EQ(sub[0].attributes, files::kAttrDirectory);
+    EXPECT_EQ(files::Find("C:\\app\\src.txt")[0].size, 11u);
+
+    EXPECT_EQ(names("C:\\app\\s?.txt"), "");
+    EXPECT_EQ(plat::LastError(), plat::kErrorFileNotFound);
+    EXPECT_EQ(names("C:\\none\\*"), "");
+    EXPECT_EQ(plat::LastError(), plat::kErrorPathNotFound);
+}
+
+TEST_F(Files, ModuleFileNameNamesTheRunningProgram) {
+    const std::string self = fs::canonical("/proc/self/exe").string();
+    EXPECT_EQ(plat::paths::ToHost(files::ModuleFileName(nullptr)), self);
+    EXPECT_EQ(files::ModuleFileName(reinterpret_cast<const void*>(&kSomeTime)),
+              files::ModuleFileName(nullptr));
+}
+
+TEST_F(Files, DurableWritesReplaceWholeOrNotAtAll) {
+    ASSERT_TRUE(files::WriteAllDurably("C:\\app\\table.csv", "v1"));
+    plat::fault::FailNth(plat::fault::Op::Write, 1, plat::kErrorDiskFull);
+    ExpectFails(files::WriteAllDurably("C:\\app\\table.csv", "v2"), plat::kErrorDiskFull);
+    std::string bytes;
+    ASSERT_TRUE(files::ReadAll("C:\\App\\Table.csv", &bytes));
+    EXPECT_EQ(bytes, "v1");
+    ASSERT_TRUE(files::WriteAllDurably("C:\\app\\table.csv", "v3"));
+    ASSERT_TRUE(files::ReadAll("C:\\app\\table.csv", &bytes));
+    EXPECT_EQ(bytes, "v3");
+    ExpectFails(files::WriteAllDurably("C:\\none\\t.csv", "x"), plat::kErrorPathNotFound);
+    ExpectFails(files::ReadAll("C:\\app\\none.csv", &bytes), plat::kErrorFileNotFound);
+    EXPECT_EQ(Leftovers().size(), 3u);
+}
+
+}  // namespace

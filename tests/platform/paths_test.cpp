@@ -1,0 +1,155 @@
+// Windows path rules, the machine layout and the mapping of Windows paths to host paths.
+#include "platform/paths.h"
+
+#include <gtest/gtest.h>
+
+#include <filesystem>
+#include <fstream>
+
+#include "platform/errors.h"
+#include "platform/machine.h"
+#include "tests/support/test_machine.h"
+
+namespace {
+
+using plat::paths::PathParts;
+namespace fs = std::filesystem;
+
+TEST(SplitPath, MatchesTheRunTimeTable) {
+    struct Row {
+        const char* path;
+        PathParts parts;
+    };
+    const Row rows[] = {
+        {"\"C:\\App\\victim.txt\"", {"", "\"C:\\App\\", "victim", ".txt\""}},
+        {"C:", {"C:", "", "", ""}},
+        {"a.b.c", {"", "", "a.b", ".c"}},
+        {".\\App", {"", ".\\", "App", ""}},
+        {"\\Program Files\\App", {"", "\\Program Files\\", "App", ""}},
+        {"Sub\\App", {"", "Sub\\", "App", ""}},
+        {"C:\\x\\y.txt", {"C:", "\\x\\", "y", ".txt"}},
+        {"C:x.txt", {"C:", "", "x", ".txt"}},
+        {"dir/file", {"", "dir/", "file", ""}},
+        {"noext.", {"", "", "noext", "."}},
+        {".hidden", {"", "", "", ".hidden"}},
+        {"C:\\App\\", {"C:", "\\App\\", "", ""}},
+        {"\\\\server\\share\\f.txt", {"", "\\\\server\\share\\", "f", ".txt"}},
+    };
+    for (const Row& row : rows) {
+        SCOPED_TRACE(row.path);
+        const PathParts p = plat::paths::SplitPath(row.path);
+        EXPECT_EQ(p.drive, row.parts.drive);
+        EXPECT_EQ(p.dir, row.parts.dir);
+        EXPECT_EQ(p.fname, row.parts.fname);
+        EXPECT_EQ(p.ext, row.parts.ext);
+        // The parts of a split path merge back into the same text.
+        EXPECT_EQ(plat::paths::MakePath(p), row.path);
+    }
+}
+
+TEST(MakePath, AddsTheMissingSeparatorsAndDot) {
+    EXPECT_EQ(plat::paths::MakePath({"C", "x", "f", "txt"}), "C:x\\f.txt");
+    EXPECT_EQ(plat::paths::MakePath({"D:", "\\a/", "", ".log"}), "D:\\a/.log");
+    EXPECT_EQ(plat::paths::MakePath({"", "", "f", ""}), "f");
+}
+
+TEST(ComposePath, TakesEachPartFromTheFirstElseTheSecondPath) {
+    using plat::paths::ComposePath;
+    EXPECT_EQ(ComposePath("C:\\x\\y.txt", "", 8 + 4), "C:\\x\\");
+    EXPECT_EQ(ComposePath("C:\\x\\y.txt", "D:\\p\\q.dat", 8 + 4 + 32 + 16), "C:\\x\\q.dat");
+    EXPECT_EQ(ComposePath("C:\\x\\y.txt", "D:\\p\\q.dat", 0xFF), "C:\\x\\y.txt");
+    EXPECT_EQ(ComposePath("C:\\x\\y.txt", "D:\\p\\q.dat", 0xF0), "D:\\p\\q.dat");
+    // A part selected from the first path stays out when that path lacks it.
+    EXPECT_EQ(ComposePath("C:\\x\\y", "q.dat", 2 + 1 + 16), "y");
+    EXPECT_EQ(ComposePath("C:\\x\\y.txt", "D:\\p\\q.dat", 0), "");
+}
+
+TEST(AddSeparator, AppendsOneBackslashToNonEmptyText) {
+    EXPECT_EQ(plat::paths::AddSeparator(""), "");
+    EXPECT_EQ(plat::paths::AddSeparator("C:\\x"), "C:\\x\\");
+    EXPECT_EQ(plat::paths::AddSeparator("C:\\x\\"), "C:\\x\\");
+}
+
+TEST(Machine, EnsureLaysOutAPrefixAndAdoptsAnExistingDriveC) {
+    pextest::TestMachine m;
+    EXPECT_EQ(plat::machine::Root(), m.Root());
+    EXPECT_TRUE(fs::is_directory(m.DriveC() + "/windows/system32"));
+    EXPECT_TRUE(fs::is_directory(m.DriveC() + "/windows/temp"));
+    EXPECT_EQ(fs::read_symlink(m.Root() + "/dosdevices/c:"), "../drive_c");
+    EXPECT_EQ(fs::read_symlink(m.Root() + "/dosdevices/z:"), "/");
+
+    pextest::TestMachine adopted;
+    fs::remove_all(adopted.DriveC() + "/windows");
+    fs::create_directories(adopted.DriveC() + "/Windows/SYSTEM32");
+    ASSERT_TRUE(plat::machine::Ensure());
+    EXPECT_FALSE(fs::exists(adopted.DriveC() + "/windows"));
+    EXPECT_TRUE(fs::is_directory(adopted.DriveC() + "/Windows/temp"));
+}
+
+int rootChanges = 0;
+void CountRootChange() { ++rootChanges; }
+
+TEST(Machine, SetRootTellsTheRegisteredListenersOnceEach) {
+    plat::machine::OnRootChange(&CountRootChange);
+    plat::machine::OnRootChange(&CountRootChange);
+    const int before = rootChanges;
+    pextest::TestMachine m;
+    EXPECT_EQ(rootChanges, before + 1);
+}
+
+TEST(ToHost, MatchesExistingComponentsWithoutRegardToCase) {
+    pextest::TestMachine m;
+    m.WriteFile("C:\\app\\a.dll", "x");
+    EXPECT_EQ(plat::paths::ToHost("C:\\App\\A.DLL"), m.DriveC() + "/app/a.dll");
+    EXPECT_EQ(plat::paths::ToHost("c:/APP/New.Txt"), m.DriveC() + "/app/New.Txt");
+    EXPECT_EQ(plat::paths::ToHost("C:\\New\\Sub\\"), m.DriveC() + "/New/Sub");
+    EXPECT_EQ(plat::paths::ToHost("\\WINDOWS\\System32"), m.DriveC() + "/windows/system32");
+    EXPECT_EQ(plat::paths::ToHost("Q:\\x"), "");
+    EXPECT_EQ(plat::LastError(), plat::kErrorPathNotFound);
+}
+
+TEST(ToWindows, NamesTheDriveThatHoldsTheHostPathElseZ) {
+    pextest::TestMachine m;
+    m.WriteFile("C:\\app\\a.dll", "x");
+    EXPECT_EQ(plat::paths::ToWindows(m.DriveC() + "/app/a.dll"), "C:\\app\\a.dll");
+    EXPECT_EQ(plat::paths::ToWindows(m.DriveC()), "C:\\");
+    const std::string outside = fs::weakly_canonical(m.Root()).string() + "/elsewhere";
+    std::string expected = "Z:" + outside;
+    for (char& c : expected) c = c == '/' ? '\\' : c;
+    EXPECT_EQ(plat::paths::ToWindows(outside), expected);
+    EXPECT_EQ(plat::paths::ToHost(expected), outside);
+    EXPECT_EQ(plat::paths::ToHost("Z:\\"), "/");
+}
+
+TEST(CurrentDirectory, ResolvesRelativePathsAndDrivesTheCurrentDrive) {
+    pextest::TestMachine m;
+    m.WriteFile("C:\\app\\a.dll", "x");
+    using plat::paths::FullPath;
+    EXPECT_EQ(plat::paths::CurrentDirectory(), "C:\\");
+    ASSERT_TRUE(plat::paths::ChangeDirectory("c:/APP/"));
+    EXPECT_EQ(plat::paths::CurrentDirectory(), "C:\\APP");
+    EXPECT_EQ(plat::paths::ToHost("a.dll"), m.DriveC() + "/app/a.dll");
+    EXPECT_EQ(FullPath("..\\x\\.\\y\\"), "C:\\x\\y\\");
+    EXPECT_EQ(FullPath("\\..\\q"), "C:\\q");
+    EXPECT_EQ(FullPath("C:sub"), "C:\\APP\\sub");
+    EXPECT_EQ(FullPath("d:/a//b"), "D:\\a\\b");
+
+    ASSERT_TRUE(plat::paths::ChangeDirectory("Z:\\tmp"));
+    EXPECT_EQ(plat::paths::CurrentDrive(), 'Z');
+    EXPECT_EQ(FullPath("\\etc"), "Z:\\etc");
+    EXPECT_EQ(FullPath("C:sub"), "C:\\sub");
+}
+
+TEST(CurrentDirectory, RefusesMissingFoldersAndRestartsWithANewMachine) {
+    pextest::TestMachine m;
+    ASSERT_TRUE(plat::paths::ChangeDirectory("C:\\windows"));
+    EXPECT_FALSE(plat::paths::ChangeDirectory("C:\\nope"));
+    EXPECT_EQ(plat::LastError(), plat::kErrorFileNotFound);
+    EXPECT_FALSE(plat::paths::ChangeDirectory("C:\\nope\\deeper"));
+    EXPECT_EQ(plat::LastError(), plat::kErrorPathNotFound);
+    EXPECT_EQ(plat::paths::CurrentDirectory(), "C:\\windows");
+    plat::machine::SetRoot(m.Root());
+    EXPECT_EQ(plat::paths::CurrentDirectory(), "C:\\");
+}
+
+}  // namespace
