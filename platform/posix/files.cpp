@@ -177,7 +177,8 @@ struct Finish {
 // is removed on failure.
 bool ReplaceAtomically(const std::string& target, const std::function<bool(int)>& fill,
                        const Finish& finish) {
-    std::string temp = Parent(target) + "/.pex~" + BaseName(target) + ".XXXXXX";
+    // The name is cut so that a long target name still leaves room for the temporary one.
+    std::string temp = Parent(target) + "/.pex~" + BaseName(target).substr(0, 64) + ".XXXXXX";
     const int fd = mkostemp(temp.data(), O_CLOEXEC);
     if (fd < 0) return FailErrno(target);
     bool ok = fill(fd) && fchmod(fd, finish.mode & 07777) == 0 &&

@@ -5,8 +5,8 @@
 #include <dirent.h>
 #include <strings.h>
 #include <sys/stat.h>
-#include <unistd.h>
 
+#include <algorithm>
 #include <cctype>
 #include <cerrno>
 #include <filesystem>
@@ -94,12 +94,15 @@ std::string DriveHostFolder(const std::string& root, char letter) {
     return host;
 }
 
+std::string JoinHost(const std::string& dir, const std::string& name) {
+    return (dir == "/" ? "" : dir) + "/" + name;
+}
+
 // The entry of the host folder dir that is called name, without regard to ASCII case; the
 // exact spelling wins when it exists. Empty when there is none.
 std::string MatchChild(const std::string& dir, const std::string& name) {
-    const std::string exact = (dir == "/" ? "" : dir) + "/" + name;
     struct stat st;
-    if (lstat(exact.c_str(), &st) == 0) return name;
+    if (lstat(JoinHost(dir, name).c_str(), &st) == 0) return name;
     DIR* d = opendir(dir.c_str());
     if (!d) return std::string();
     std::string found;
@@ -111,10 +114,6 @@ std::string MatchChild(const std::string& dir, const std::string& name) {
     }
     closedir(d);
     return found;
-}
-
-std::string JoinHost(const std::string& dir, const std::string& name) {
-    return (dir == "/" ? "" : dir) + "/" + name;
 }
 
 // Missing pieces of a machine are made on its first use.
@@ -129,7 +128,7 @@ void EnsureOnce(const std::string& root) {
     SetLastErrorCode(saved);
 }
 
-bool IsFolder(const std::string& host, std::uint32_t* error) {
+bool CheckFolder(const std::string& host, std::uint32_t* error) {
     struct stat st;
     if (stat(host.c_str(), &st) == 0) {
         *error = S_ISDIR(st.st_mode) ? kErrorSuccess : kErrorPathNotFound;
@@ -143,6 +142,29 @@ bool IsFolder(const std::string& host, std::uint32_t* error) {
     const std::string parent = fs::path(host).parent_path().string();
     *error = stat(parent.c_str(), &st) == 0 ? kErrorFileNotFound : kErrorPathNotFound;
     return false;
+}
+
+// The drive whose folder holds the canonical host path, and that folder. The deepest drive
+// wins; Z: (the host's root) holds everything, even when its link is missing.
+char DriveHolding(const std::string& root, const std::string& host, std::string* folderOut) {
+    char best = 'Z';
+    *folderOut = "/";
+    DIR* d = opendir((root + "/dosdevices").c_str());
+    while (dirent* e = d ? readdir(d) : nullptr) {
+        const std::string name = e->d_name;
+        if (name.size() != 2 || name[1] != ':' || !std::isalpha(static_cast<unsigned char>(name[0]))) continue;
+        std::error_code ec;
+        std::string folder = fs::weakly_canonical(DriveHostFolder(root, name[0]), ec).string();
+        if (ec || folder.empty()) continue;
+        while (folder.size() > 1 && folder.back() == '/') folder.pop_back();
+        const bool inside = host == folder || host.compare(0, folder.size() + 1, folder + "/") == 0;
+        if (inside && folder.size() > folderOut->size()) {
+            best = static_cast<char>(std::toupper(static_cast<unsigned char>(name[0])));
+            *folderOut = folder;
+        }
+    }
+    if (d) closedir(d);
+    return best;
 }
 
 }  // namespace
@@ -166,7 +188,7 @@ bool ChangeDirectory(const std::string& winPath) {
     const std::string host = ToHost(full);
     if (host.empty()) return false;
     std::uint32_t error = kErrorSuccess;
-    if (!IsFolder(host, &error)) {
+    if (!CheckFolder(host, &error)) {
         SetLastErrorCode(error);
         return false;
     }
@@ -230,34 +252,18 @@ std::string ToHost(const std::string& winPath) {
 }
 
 std::string ToWindows(const std::string& hostPath) {
+    if (hostPath.empty()) return std::string();
     std::error_code ec;
     fs::path abs = fs::weakly_canonical(fs::absolute(hostPath, ec), ec);
     std::string host = abs.lexically_normal().string();
     while (host.size() > 1 && host.back() == '/') host.pop_back();
-    const std::string root = machine::Root();
-    char best = 'Z';
-    std::string bestFolder = "/";
-    DIR* d = opendir((root + "/dosdevices").c_str());
-    while (dirent* e = d ? readdir(d) : nullptr) {
-        const std::string name = e->d_name;
-        if (name.size() != 2 || name[1] != ':' || !std::isalpha(static_cast<unsigned char>(name[0]))) continue;
-        std::string folder = fs::weakly_canonical(DriveHostFolder(root, name[0]), ec).string();
-        if (ec || folder.empty()) continue;
-        while (folder.size() > 1 && folder.back() == '/') folder.pop_back();
-        const bool inside = host == folder || folder == "/" ||
-                            host.compare(0, folder.size() + 1, folder + "/") == 0;
-        // The deepest drive holding the path names it; Z: (the host's root) holds everything.
-        if (inside && folder.size() > bestFolder.size()) {
-            best = static_cast<char>(std::toupper(static_cast<unsigned char>(name[0])));
-            bestFolder = folder;
-        }
-    }
-    if (d) closedir(d);
-    std::string rest = bestFolder == "/" ? host.substr(1) : host.substr(std::min(host.size(), bestFolder.size() + 1));
+    std::string folder;
+    const char letter = DriveHolding(machine::Root(), host, &folder);
+    std::string rest = host.substr(std::min(host.size(), folder == "/" ? 1 : folder.size() + 1));
     for (char& c : rest) {
         if (c == '/') c = '\\';
     }
-    return std::string(1, best) + ":\\" + rest;
+    return std::string(1, letter) + ":\\" + rest;
 }
 
 }  // namespace plat::paths

@@ -64,12 +64,6 @@ TEST(ComposePath, TakesEachPartFromTheFirstElseTheSecondPath) {
     EXPECT_EQ(ComposePath("C:\\x\\y.txt", "D:\\p\\q.dat", 0), "");
 }
 
-TEST(AddSeparator, AppendsOneBackslashToNonEmptyText) {
-    EXPECT_EQ(plat::paths::AddSeparator(""), "");
-    EXPECT_EQ(plat::paths::AddSeparator("C:\\x"), "C:\\x\\");
-    EXPECT_EQ(plat::paths::AddSeparator("C:\\x\\"), "C:\\x\\");
-}
-
 TEST(Machine, EnsureLaysOutAPrefixAndAdoptsAnExistingDriveC) {
     pextest::TestMachine m;
     EXPECT_EQ(plat::machine::Root(), m.Root());
