@@ -205,8 +205,9 @@ bool ReplaceAtomically(const std::string& target, const std::function<bool(int)>
 bool CheckTarget(const std::string& host, bool failIfExists, bool* exists, struct stat* st) {
     *exists = stat(host.c_str(), st) == 0;
     if (!*exists) {
-        if (errno == ENOENT && IsFolder(Parent(host))) return true;
-        return Fail(errno == ENOENT ? kErrorPathNotFound : CodeFor(errno, host));
+        const int err = errno;
+        if (err != ENOENT) return Fail(CodeFor(err, host));
+        return IsFolder(Parent(host)) || Fail(kErrorPathNotFound);
     }
     if (failIfExists) return Fail(kErrorFileExists);
     return MayReplace(host, *st);
