@@ -40,7 +40,12 @@ public:
     CFile& operator=(const CFile&) = delete;
     virtual ~CFile();  // closes an open file, never throws
 
-    // Opens by Windows path; false (and *error filled when given) on failure.
+    // Opens by Windows path; false (and *error filled when given, last error set) on failure:
+    // 2 missing file, 3 missing folder, 5 a folder or a read-only file opened for writing,
+    // 32 when another opener's share mode refuses this access or this share mode refuses
+    // another opener's. shareDenyNone lets every other opener in; shareDenyWrite lets other
+    // readers in; shareExclusive, shareDenyRead and no share flag let nobody in. A refused
+    // modeCreate open leaves the file untouched.
     virtual bool Open(const std::string& path, unsigned flags, CFileException* error = nullptr);
     // Reads up to count bytes; returns the number read (0 at the end). Throws CFileException.
     virtual std::uint32_t Read(void* buffer, std::uint32_t count);

@@ -1,0 +1,15 @@
+# The application framework's pieces: file class, synchronisation and time, date parser, COM
+# string, application object. Portable code sits in platform/, the rest in the backend folder.
+if(WIN32)
+  set(PEX_FRAMEWORK_BACKEND win32)
+else()
+  set(PEX_FRAMEWORK_BACKEND posix)
+endif()
+
+add_library(pex_framework STATIC
+  ${CMAKE_CURRENT_SOURCE_DIR}/cfile_exception.cpp
+  ${CMAKE_CURRENT_SOURCE_DIR}/${PEX_FRAMEWORK_BACKEND}/cfile.cpp)
+# Paths, errors and the fault plan come from the base.
+target_link_libraries(pex_framework PUBLIC pex_platform_base)
+pex_warnings(pex_framework)
+target_link_libraries(pex_platform INTERFACE pex_framework)

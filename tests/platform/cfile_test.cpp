@@ -1,0 +1,144 @@
+// The framework's file class over the emulated machine: open modes, share modes as other
+// openers see them, errors as Windows codes, and writes refused by the fault plan.
+#include "platform/cfile.h"
+
+#include <gtest/gtest.h>
+
+#include "platform/errors.h"
+#include "platform/fault.h"
+#include "platform/files.h"
+#include "tests/support/test_machine.h"
+
+namespace {
+
+using plat::CFile;
+using plat::CFileException;
+
+constexpr unsigned kCreateWrite = CFile::modeCreate | CFile::modeWrite | CFile::shareExclusive;
+
+class CFileTest : public ::testing::Test {
+protected:
+    void SetUp() override {
+        plat::fault::Clear();
+        m.WriteFile("C:\\app\\data.bin", "0123456789");
+    }
+    void TearDown() override { plat::fault::Clear(); }
+
+    // Opens and expects failure with the Windows code, both in the exception and the last error.
+    static void ExpectOpenFails(const std::string& path, unsigned flags, std::uint32_t code) {
+        CFile file;
+        CFileException error(0, "");
+        EXPECT_FALSE(file.Open(path, flags, &error)) << path;
+        EXPECT_EQ(error.OsError(), code) << path;
+        EXPECT_EQ(plat::LastError(), code) << path;
+        EXPECT_FALSE(file.IsOpen());
+    }
+
+    pextest::TestMachine m;
+};
+
+TEST_F(CFileTest, WritesReadsAndSeeksByWindowsPath) {
+    {
+        CFile out;
+        ASSERT_TRUE(out.Open("C:\\APP\\new.bin", kCreateWrite));
+        out.Write("hello world", 11);
+        EXPECT_EQ(out.GetPosition(), 11u);
+        EXPECT_EQ(out.Seek(-5, CFile::end), 6u);
+        out.Write("WORLD", 5);
+        EXPECT_EQ(out.GetLength(), 11u);
+    }
+    EXPECT_EQ(m.ReadFile("C:\\app\\new.bin"), "hello WORLD");
+
+    CFile in;
+    ASSERT_TRUE(in.Open("c:/app/NEW.BIN", CFile::modeRead | CFile::shareDenyWrite));
+    char buffer[32] = {};
+    EXPECT_EQ(in.Seek(6, CFile::begin), 6u);
+    EXPECT_EQ(in.Read(buffer, sizeof buffer), 5u);
+    EXPECT_EQ(std::string(buffer, 5), "WORLD");
+    EXPECT_EQ(in.Read(buffer, sizeof buffer), 0u);  // at the end
+    EXPECT_THROW(in.Seek(-100, CFile::current), CFileException);
+}
+
+TEST_F(CFileTest, CreateTruncatesUnlessNoTruncate) {
+    CFile keep;
+    ASSERT_TRUE(keep.Open("C:\\app\\data.bin",
+                          CFile::modeCreate | CFile::modeNoTruncate | CFile::modeReadWrite | CFile::shareDenyNone));
+    EXPECT_EQ(keep.GetLength(), 10u);
+    keep.Close();
+
+    CFile fresh;
+    ASSERT_TRUE(fresh.Open("C:\\app\\data.bin", kCreateWrite));
+    EXPECT_EQ(fresh.GetLength(), 0u);
+}
+
+TEST_F(CFileTest, OpenReportsWindowsCodes) {
+    ExpectOpenFails("C:\\app\\missing.bin", CFile::modeRead, plat::kErrorFileNotFound);
+    ExpectOpenFails("C:\\nowhere\\data.bin", CFile::modeRead, plat::kErrorPathNotFound);
+    ExpectOpenFails("C:\\nowhere\\data.bin", kCreateWrite, plat::kErrorPathNotFound);
+    ExpectOpenFails("C:\\app", CFile::modeRead, plat::kErrorAccessDenied);
+
+    ASSERT_TRUE(plat::files::SetAttributes("C:\\app\\data.bin", plat::files::kAttrReadOnly));
+    ExpectOpenFails("C:\\app\\data.bin", kCreateWrite, plat::kErrorAccessDenied);
+    EXPECT_EQ(m.ReadFile("C:\\app\\data.bin"), "0123456789");
+    CFile reader;
+    EXPECT_TRUE(reader.Open("C:\\app\\data.bin", CFile::modeRead | CFile::shareDenyNone));
+}
+
+TEST_F(CFileTest, ExclusiveHolderMakesTheFileInUseUntilClosed) {
+    auto holder = std::make_unique<CFile>();
+    ASSERT_TRUE(holder->Open("C:\\app\\data.bin", CFile::modeReadWrite | CFile::shareExclusive));
+
+    ExpectOpenFails("C:\\app\\data.bin", CFile::modeRead | CFile::shareDenyNone, plat::kErrorSharingViolation);
+    ExpectOpenFails("C:\\app\\data.bin", kCreateWrite, plat::kErrorSharingViolation);
+    EXPECT_EQ(m.ReadFile("C:\\app\\data.bin"), "0123456789");  // not truncated by the refused open
+    m.WriteFile("C:\\app\\other.bin", "x");
+    EXPECT_FALSE(plat::files::Copy("C:\\app\\other.bin", "C:\\app\\data.bin", false));
+    EXPECT_EQ(plat::LastError(), plat::kErrorSharingViolation);
+
+    holder.reset();  // the destructor closes and releases the file
+    EXPECT_TRUE(plat::files::Copy("C:\\app\\other.bin", "C:\\app\\data.bin", false));
+}
+
+TEST_F(CFileTest, ShareModesLetCompatibleOpenersIn) {
+    CFile reader1, reader2, sharing;
+    ASSERT_TRUE(reader1.Open("C:\\app\\data.bin", CFile::modeRead | CFile::shareDenyWrite));
+    EXPECT_TRUE(reader2.Open("C:\\app\\data.bin", CFile::modeRead | CFile::shareDenyWrite));
+    EXPECT_TRUE(sharing.Open("C:\\app\\data.bin", CFile::modeRead | CFile::shareDenyNone));
+    // Readers that deny writing keep writers out, sharing ones included.
+    ExpectOpenFails("C:\\app\\data.bin", CFile::modeReadWrite | CFile::shareDenyNone, plat::kErrorSharingViolation);
+    reader1.Close();
+    reader2.Close();
+
+    CFile writer1, writer2;
+    ASSERT_TRUE(writer1.Open("C:\\app\\data.bin", CFile::modeReadWrite | CFile::shareDenyNone));
+    EXPECT_TRUE(writer2.Open("C:\\app\\data.bin", CFile::modeReadWrite | CFile::shareDenyNone));
+    EXPECT_TRUE(plat::files::Copy("C:\\app\\data.bin", "C:\\app\\copy.bin", false));
+}
+
+TEST_F(CFileTest, RefusedWriteThrowsTheCodeAndWritesNothing) {
+    CFile out;
+    ASSERT_TRUE(out.Open("C:\\app\\out.bin", kCreateWrite));
+    out.Write("ab", 2);
+    plat::fault::FailNth(plat::fault::Op::Write, 1, plat::kErrorDiskFull);
+    try {
+        out.Write("cd", 2);
+        FAIL() << "the write was not refused";
+    } catch (const CFileException& e) {
+        EXPECT_EQ(e.OsError(), plat::kErrorDiskFull);
+        EXPECT_EQ(e.FileName(), "C:\\app\\out.bin");
+    }
+    out.Write("ef", 2);  // only the first write after the rule fails
+    out.Close();
+    EXPECT_EQ(m.ReadFile("C:\\app\\out.bin"), "abef");
+}
+
+TEST_F(CFileTest, OperationsOnAClosedFileThrow) {
+    CFile file;
+    char byte;
+    EXPECT_THROW(file.Read(&byte, 1), CFileException);
+    EXPECT_THROW(file.Write("x", 1), CFileException);
+    EXPECT_THROW(file.GetLength(), CFileException);
+    EXPECT_NO_THROW(file.Close());
+}
+
+}  // namespace
