@@ -8,8 +8,13 @@ endif()
 
 add_library(pex_framework STATIC
   ${CMAKE_CURRENT_SOURCE_DIR}/cfile_exception.cpp
-  ${CMAKE_CURRENT_SOURCE_DIR}/${PEX_FRAMEWORK_BACKEND}/cfile.cpp)
+  ${CMAKE_CURRENT_SOURCE_DIR}/${PEX_FRAMEWORK_BACKEND}/cfile.cpp
+  ${CMAKE_CURRENT_SOURCE_DIR}/${PEX_FRAMEWORK_BACKEND}/sync.cpp)
 # Paths, errors and the fault plan come from the base.
 target_link_libraries(pex_framework PUBLIC pex_platform_base)
+if(NOT WIN32)
+  find_package(Threads REQUIRED)
+  target_link_libraries(pex_framework PUBLIC Threads::Threads)
+endif()
 pex_warnings(pex_framework)
 target_link_libraries(pex_platform INTERFACE pex_framework)
