@@ -9,6 +9,7 @@ endif()
 add_library(pex_framework STATIC
   ${CMAKE_CURRENT_SOURCE_DIR}/cfile_exception.cpp
   ${CMAKE_CURRENT_SOURCE_DIR}/ole_date.cpp
+  ${CMAKE_CURRENT_SOURCE_DIR}/bstr.cpp
   ${CMAKE_CURRENT_SOURCE_DIR}/${PEX_FRAMEWORK_BACKEND}/cfile.cpp
   ${CMAKE_CURRENT_SOURCE_DIR}/${PEX_FRAMEWORK_BACKEND}/sync.cpp)
 # Paths, errors and the fault plan come from the base.
