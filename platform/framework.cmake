@@ -10,10 +10,14 @@ add_library(pex_framework STATIC
   ${CMAKE_CURRENT_SOURCE_DIR}/cfile_exception.cpp
   ${CMAKE_CURRENT_SOURCE_DIR}/ole_date.cpp
   ${CMAKE_CURRENT_SOURCE_DIR}/bstr.cpp
+  ${CMAKE_CURRENT_SOURCE_DIR}/app.cpp
   ${CMAKE_CURRENT_SOURCE_DIR}/${PEX_FRAMEWORK_BACKEND}/cfile.cpp
   ${CMAKE_CURRENT_SOURCE_DIR}/${PEX_FRAMEWORK_BACKEND}/sync.cpp)
-# Paths, errors and the fault plan come from the base.
+# Paths, errors and the fault plan come from the base; the application profile from the registry.
 target_link_libraries(pex_framework PUBLIC pex_platform_base)
+if(TARGET pex_registry)
+  target_link_libraries(pex_framework PUBLIC pex_registry)
+endif()
 if(NOT WIN32)
   find_package(Threads REQUIRED)
   target_link_libraries(pex_framework PUBLIC Threads::Threads)
