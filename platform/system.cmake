@@ -34,3 +34,6 @@ target_link_libraries(pex_system PUBLIC
   ${CMAKE_DL_LIBS})
 target_link_libraries(pex_platform INTERFACE pex_system)
 pex_warnings(pex_system)
+
+# pex_stamp_version(): the modules and programs built after the platform stamp their version.
+include(${CMAKE_SOURCE_DIR}/cmake/version_stamp.cmake)

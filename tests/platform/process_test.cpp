@@ -1,0 +1,150 @@
+// Processes: start by command line with Windows splitting and search rules, wait, exit code.
+// The child is pextestprog, built beside this test program (the application folder).
+#include "platform/process.h"
+
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+#include <filesystem>
+#include <string>
+#include <vector>
+
+#include "platform/errors.h"
+#include "platform/fault.h"
+#include "platform/files.h"
+#include "platform/paths.h"
+#include "tests/support/test_machine.h"
+
+namespace {
+
+using plat::proc::Process;
+using plat::proc::WaitResult;
+
+// Runs a command line to its end; the exit code, or -1 when it did not start.
+long RunToEnd(const std::string& line, const std::string& dir = "") {
+    Process p;
+    if (!plat::proc::Start(line, dir, &p)) return -1;
+    EXPECT_EQ(plat::proc::Wait(p, plat::proc::kInfinite), WaitResult::Ended);
+    std::uint32_t code = 0;
+    EXPECT_TRUE(plat::proc::ExitCode(p, &code));
+    return static_cast<long>(code);
+}
+
+// Puts a copy of pextestprog on the machine under another name (its execute bit kept).
+void InstallTestProgram(const pextest::TestMachine& m, const std::string& winPath) {
+    std::string app = plat::files::ModuleFileName(nullptr);
+    std::string prog = app.substr(0, app.find_last_of('\\') + 1) + "pextestprog";
+    m.WriteFile(winPath, "");
+    std::filesystem::copy_file(plat::paths::ToHost(prog), plat::paths::ToHost(winPath),
+                               std::filesystem::copy_options::overwrite_existing);
+}
+
+TEST(SplitCommandLine, FollowsTheWindowsRules) {
+    using V = std::vector<std::string>;
+    EXPECT_EQ(plat::proc::SplitCommandLine(R"(prog a  b	c)"), (V{"prog", "a", "b", "c"}));
+    EXPECT_EQ(plat::proc::SplitCommandLine(R"("C:\Program Files\x.exe" "a b" c")"),
+              (V{R"(C:\Program Files\x.exe)", "a b", "c"}));
+    // Backslashes count only before a quote: 2n give n, 2n+1 give n and a literal quote.
+    EXPECT_EQ(plat::proc::SplitCommandLine(R"(p a\\b a\\\"b "a\\" x\"y "" "a""b")"),
+              (V{"p", R"(a\\b)", R"(a\"b)", R"(a\)", R"(x"y)", "", R"(a"b)"}));
+    // The program name keeps its backslashes, even before a closing quote.
+    EXPECT_EQ(plat::proc::SplitCommandLine(R"(C:\dir\ x)"), (V{R"(C:\dir\)", "x"}));
+    EXPECT_TRUE(plat::proc::SplitCommandLine("   ").empty());
+}
+
+TEST(Process, ExitCodeOfAProgramFoundInTheApplicationFolder) {
+    pextest::TestMachine m;
+    EXPECT_EQ(RunToEnd("pextestprog exit 7"), 7);
+    // The Windows name of the program also finds it.
+    EXPECT_EQ(RunToEnd("pextestprog.exe exit 3"), 3);
+    EXPECT_EQ(RunToEnd("PEXTESTPROG exit 0"), 0);
+}
+
+TEST(Process, ProgramsInTheCurrentFolderOnPathAndByFullPath) {
+    pextest::TestMachine m;
+    InstallTestProgram(m, "C:\\cur\\here.exe");
+    InstallTestProgram(m, "C:\\tools\\onpath.exe");
+    InstallTestProgram(m, "C:\\Program Files\\Vantric Tool\\run me.exe");
+    ASSERT_TRUE(plat::paths::ChangeDirectory("C:\\cur"));
+    EXPECT_EQ(RunToEnd("here exit 4"), 4);
+
+    std::string saved = std::getenv("PATH") ? std::getenv("PATH") : "";
+    setenv("PATH", "C:\\nowhere;C:\\tools", 1);
+    long onPath = RunToEnd("onpath.exe exit 5");
+    setenv("PATH", saved.c_str(), 1);
+    EXPECT_EQ(onPath, 5);
+
+    EXPECT_EQ(RunToEnd(R"("C:\Program Files\Vantric Tool\run me.exe" exit 6)"), 6);
+    // Unquoted, Windows tries the path at each blank until a program is found; the program
+    // then sees the rest of the line split at the blanks (an unknown command: 99).
+    EXPECT_EQ(RunToEnd(R"(C:\Program Files\Vantric Tool\run me.exe exit 6)"), 99);
+}
+
+TEST(Process, CommandLineReachesTheProgramIntact) {
+    pextest::TestMachine m;
+    ASSERT_TRUE(plat::files::MakeDirectory("C:\\Work Dir"));
+    EXPECT_EQ(RunToEnd(R"(pextestprog argv out.txt "a b" c\"d e\\f "g\\\"h" "" tail\ "x|y>z" $HOME *)",
+                       "C:\\Work Dir"),
+              0);
+    std::string seen = m.ReadFile("C:\\Work Dir\\out.txt");
+    EXPECT_EQ(seen.substr(seen.find('\n') + 1),
+              "argv\nout.txt\na b\nc\"d\ne\\\\f\ng\\\"h\n\ntail\\\nx|y>z\n$HOME\n*\n");
+}
+
+TEST(Process, WorkingFolderDefaultsToTheCurrentFolder) {
+    pextest::TestMachine m;
+    ASSERT_TRUE(plat::files::MakeDirectory("C:\\cur"));
+    ASSERT_TRUE(plat::paths::ChangeDirectory("C:\\cur"));
+    EXPECT_EQ(RunToEnd("pextestprog mark marker.txt"), 0);
+    EXPECT_EQ(m.ReadFile("C:\\cur\\marker.txt"), "marked\n");
+}
+
+TEST(Process, ProgramThatCannotStart) {
+    pextest::TestMachine m;
+    Process p;
+    EXPECT_FALSE(plat::proc::Start("nosuchprogram 1", "", &p));
+    EXPECT_EQ(plat::LastError(), 2u);
+    EXPECT_FALSE(plat::proc::Start("C:\\nosuchprogram.exe", "", &p));
+    EXPECT_EQ(plat::LastError(), 2u);
+    EXPECT_FALSE(plat::proc::Start("C:\\nofolder\\prog.exe", "", &p));
+    EXPECT_EQ(plat::LastError(), 3u);
+    EXPECT_FALSE(plat::proc::Start("", "", &p));
+    EXPECT_EQ(plat::LastError(), 2u);
+    EXPECT_FALSE(plat::proc::Start("pextestprog exit 0", "C:\\nofolder", &p));
+    EXPECT_EQ(plat::LastError(), 267u);
+    EXPECT_FALSE(p);
+
+    plat::fault::FailNth(plat::fault::Op::ProcessStart, 1, 5);
+    EXPECT_FALSE(plat::proc::Start("pextestprog exit 0", "", &p));
+    EXPECT_EQ(plat::LastError(), 5u);
+    plat::fault::Clear();
+}
+
+TEST(Process, ProcessPastItsTimeOutIsLeftRunning) {
+    pextest::TestMachine m;
+    Process p;
+    ASSERT_TRUE(plat::proc::Start("pextestprog sleep 60000", "", &p));
+    EXPECT_EQ(plat::proc::Wait(p, 30), WaitResult::TimedOut);
+    // There is no message queue to dispatch, but the time-out still holds.
+    EXPECT_EQ(plat::proc::WaitDispatching(p, 30, true), WaitResult::TimedOut);
+    std::uint32_t code = 0;
+    ASSERT_TRUE(plat::proc::ExitCode(p, &code));
+    EXPECT_EQ(code, plat::proc::kStillActive);
+
+    ASSERT_TRUE(plat::proc::Terminate(p, 1));
+    EXPECT_EQ(plat::proc::Wait(p, 0), WaitResult::Ended);
+    ASSERT_TRUE(plat::proc::ExitCode(p, &code));
+    EXPECT_EQ(code, 1u);
+}
+
+TEST(Process, DispatchingWaitSeesTheEnd) {
+    pextest::TestMachine m;
+    Process p;
+    ASSERT_TRUE(plat::proc::Start("pextestprog exit 9", "", &p));
+    EXPECT_EQ(plat::proc::WaitDispatching(p, plat::proc::kInfinite, true), WaitResult::Ended);
+    std::uint32_t code = 0;
+    ASSERT_TRUE(plat::proc::ExitCode(p, &code));
+    EXPECT_EQ(code, 9u);
+}
+
+}  // namespace

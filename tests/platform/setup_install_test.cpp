@@ -1,0 +1,169 @@
+// Install at restart: a target in use (another open description holds a flock on it) is
+// staged beside itself and queued in PendingFileRenameOperations in Windows' own layout;
+// `pexupdate boot` carries the queue out.
+#include "platform/setup_install.h"
+
+#include <fcntl.h>
+#include <sys/file.h>
+#include <unistd.h>
+
+#include <gtest/gtest.h>
+
+#include <string>
+#include <vector>
+
+#include "platform/errors.h"
+#include "platform/files.h"
+#include "platform/paths.h"
+#include "platform/process.h"
+#include "platform/registry.h"
+#include "tests/support/test_machine.h"
+
+namespace {
+
+using namespace std::string_literals;
+using plat::setup::PendingRename;
+
+constexpr std::uint32_t kStyle = plat::setup::kCopySourceAbsolute | plat::setup::kCopyInUseNeedsReboot;
+
+// Holds a file in use, as a program that has it open without sharing does.
+class InUse {
+public:
+    explicit InUse(const std::string& winPath)
+        : fd_(open(plat::paths::ToHost(winPath).c_str(), O_RDONLY)) {
+        EXPECT_EQ(flock(fd_, LOCK_EX), 0);
+    }
+    ~InUse() { Release(); }
+    void Release() {
+        if (fd_ >= 0) close(fd_);
+        fd_ = -1;
+    }
+
+private:
+    int fd_;
+};
+
+// The stored value: type and bytes.
+std::string StoredQueue(std::uint32_t* type) {
+    plat::reg::Key key;
+    if (plat::reg::OpenKey(plat::reg::kLocalMachine, plat::setup::kSessionManagerKey, plat::reg::kKeyRead,
+                           key.out()) != 0)
+        return "<no key>";
+    std::uint32_t size = 0;
+    if (plat::reg::QueryValue(key.get(), plat::setup::kPendingRenamesValue, type, nullptr, &size) != 0)
+        return "<no value>";
+    std::string data(size, '\0');
+    plat::reg::QueryValue(key.get(), plat::setup::kPendingRenamesValue, type,
+                          reinterpret_cast<std::uint8_t*>(data.data()), &size);
+    return data;
+}
+
+long Boot() {
+    plat::proc::Process p;
+    if (!plat::proc::Start("pexupdate boot", "", &p)) return -1;
+    plat::proc::Wait(p, plat::proc::kInfinite);
+    std::uint32_t code = 0;
+    plat::proc::ExitCode(p, &code);
+    return static_cast<long>(code);
+}
+
+TEST(SetupInstall, FreeTargetIsInstalledAtOnce) {
+    pextest::TestMachine m;
+    m.WriteFile("C:\\dl\\new.dll", "new");
+    m.WriteFile("C:\\app\\a.dll", "old");
+    bool inUse = true;
+    ASSERT_TRUE(plat::setup::InstallFile("C:\\dl\\new.dll", "C:\\app\\a.dll", kStyle, &inUse));
+    EXPECT_FALSE(inUse);
+    EXPECT_EQ(m.ReadFile("C:\\app\\a.dll"), "new");
+    std::uint32_t type = 0;
+    EXPECT_EQ(StoredQueue(&type), "<no key>");
+}
+
+TEST(SetupInstall, TargetInUseIsQueuedAndCarriedOutAtBoot) {
+    pextest::TestMachine m;
+    m.WriteFile("C:\\dl\\a1.dll", "new a");
+    m.WriteFile("C:\\dl\\b1.dll", "new b");
+    m.WriteFile("C:\\app\\a.dll", "old a");
+    m.WriteFile("C:\\app\\b.dll", "old b");
+    InUse lockA("C:\\app\\a.dll"), lockB("C:\\app\\b.dll");
+
+    bool inUse = false;
+    ASSERT_TRUE(plat::setup::InstallFile("C:\\dl\\a1.dll", "C:\\app\\a.dll", kStyle, &inUse));
+    EXPECT_TRUE(inUse);
+    ASSERT_TRUE(plat::setup::InstallFile("C:\\dl\\b1.dll", "C:\\app\\b.dll", kStyle, &inUse));
+    EXPECT_TRUE(inUse);
+    EXPECT_EQ(m.ReadFile("C:\\app\\a.dll"), "old a");
+
+    std::vector<PendingRename> queue;
+    ASSERT_TRUE(plat::setup::ReadPendingRenames(&queue));
+    ASSERT_EQ(queue.size(), 2u);
+    const std::string stagedA = queue[0].from, stagedB = queue[1].from;
+    EXPECT_EQ(stagedA.rfind("C:\\app\\SET", 0), 0u) << stagedA;
+    EXPECT_EQ(m.ReadFile(stagedA), "new a");
+    std::uint32_t type = 0;
+    EXPECT_EQ(StoredQueue(&type), "\\??\\" + stagedA + '\0' + "!\\??\\C:\\app\\a.dll" + '\0' +
+                                      "\\??\\" + stagedB + '\0' + "!\\??\\C:\\app\\b.dll" + '\0' + '\0');
+    EXPECT_EQ(type, plat::reg::kRegMultiSz);
+
+    lockA.Release();
+    lockB.Release();
+    EXPECT_EQ(Boot(), 0);
+    EXPECT_EQ(m.ReadFile("C:\\app\\a.dll"), "new a");
+    EXPECT_EQ(m.ReadFile("C:\\app\\b.dll"), "new b");
+    EXPECT_FALSE(plat::files::Exists(stagedA));
+    EXPECT_EQ(StoredQueue(&type), "<no value>");
+}
+
+TEST(SetupInstall, FailedRenameStaysQueuedAndNothingElseIsLost) {
+    pextest::TestMachine m;
+    m.WriteFile("C:\\app\\gone.tmp", "");
+    m.WriteFile("C:\\app\\staged.tmp", "new b");
+    m.WriteFile("C:\\app\\a.dll", "old a");
+    m.WriteFile("C:\\app\\b.dll", "old b");
+    ASSERT_TRUE(plat::files::Remove("C:\\app\\gone.tmp"));
+    ASSERT_EQ(plat::setup::QueuePendingRename({"C:\\app\\gone.tmp", "C:\\app\\a.dll", true}), 0);
+    ASSERT_EQ(plat::setup::QueuePendingRename({"C:\\app\\staged.tmp", "C:\\app\\b.dll", true}), 0);
+
+    EXPECT_EQ(Boot(), 1);
+    EXPECT_EQ(m.ReadFile("C:\\app\\a.dll"), "old a");
+    EXPECT_EQ(m.ReadFile("C:\\app\\b.dll"), "new b");
+    std::uint32_t type = 0;
+    EXPECT_EQ(StoredQueue(&type), "\\??\\C:\\app\\gone.tmp\0!\\??\\C:\\app\\a.dll\0\0"s);
+}
+
+TEST(SetupInstall, OtherFailuresAreReported) {
+    pextest::TestMachine m;
+    m.WriteFile("C:\\dl\\new.dll", "new");
+    m.WriteFile("C:\\app\\ro.dll", "old");
+    ASSERT_TRUE(plat::files::SetAttributes("C:\\app\\ro.dll", plat::files::kAttrReadOnly));
+    bool inUse = true;
+    EXPECT_FALSE(plat::setup::InstallFile("C:\\dl\\missing.dll", "C:\\app\\x.dll", kStyle, &inUse));
+    EXPECT_EQ(plat::LastError(), 2u);
+    EXPECT_FALSE(inUse);
+    EXPECT_FALSE(plat::setup::InstallFile("C:\\dl\\new.dll", "C:\\app\\ro.dll", kStyle, &inUse));
+    EXPECT_EQ(plat::LastError(), 5u);
+
+    // Without the in-use style a target in use is a plain failure.
+    InUse lock("C:\\app\\ro.dll");
+    ASSERT_TRUE(plat::files::SetAttributes("C:\\app\\ro.dll", plat::files::kAttrNormal));
+    EXPECT_FALSE(plat::setup::InstallFile("C:\\dl\\new.dll", "C:\\app\\ro.dll", 0, &inUse));
+    EXPECT_EQ(plat::LastError(), 32u);
+}
+
+TEST(SetupInstall, QueueLayoutRoundTrips) {
+    std::vector<PendingRename> queue{{"C:\\a.tmp", "C:\\a.dll", true},
+                                     {"C:\\old.log", "", false},
+                                     {"C:\\b.tmp", "C:\\b.dll", false}};
+    std::string data = plat::setup::EncodePendingRenames(queue);
+    EXPECT_EQ(data, "\\??\\C:\\a.tmp\0!\\??\\C:\\a.dll\0\\??\\C:\\old.log\0\0"
+                    "\\??\\C:\\b.tmp\0\\??\\C:\\b.dll\0\0"s);
+    std::vector<PendingRename> back = plat::setup::DecodePendingRenames(data);
+    ASSERT_EQ(back.size(), 3u);
+    EXPECT_EQ(back[1].from, "C:\\old.log");
+    EXPECT_EQ(back[1].to, "");
+    EXPECT_TRUE(back[0].replace);
+    EXPECT_FALSE(back[2].replace);
+    EXPECT_EQ(back[2].to, "C:\\b.dll");
+}
+
+}  // namespace

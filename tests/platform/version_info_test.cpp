@@ -1,0 +1,112 @@
+// Version information: a real Windows DLL (tests/fixtures/versioned.dll) and our own stamped
+// ELF modules and programs, read through the same parser.
+#include "platform/version_info.h"
+
+#include <gtest/gtest.h>
+
+#include <string>
+
+#include "platform/errors.h"
+#include "platform/files.h"
+#include "platform/paths.h"
+#include "tests/support/test_machine.h"
+
+namespace {
+
+using plat::ver::VersionInfo;
+
+std::string AppFolder() {
+    std::string app = plat::files::ModuleFileName(nullptr);
+    return app.substr(0, app.find_last_of('\\') + 1);
+}
+
+std::string Fixture() { return plat::paths::ToWindows(PEX_FIXTURE_DIR "/versioned.dll"); }
+
+std::string StringOf(const VersionInfo& info, const std::string& subBlock) {
+    std::string value;
+    return info.QueryString(subBlock, &value) ? value : "<none>";
+}
+
+TEST(VersionInfo, WindowsDllFixture) {
+    pextest::TestMachine m;
+    VersionInfo info;
+    ASSERT_TRUE(plat::ver::Read(Fixture(), &info));
+    ASSERT_NE(info.Fixed(), nullptr);
+    EXPECT_EQ(info.Fixed()->signature, plat::ver::kFixedFileInfoSignature);
+    EXPECT_EQ(info.Fixed()->fileVersionMS, (3u << 16) | 10u);
+    EXPECT_EQ(info.Fixed()->fileVersionLS, (40000u << 16) | 5u);
+    EXPECT_EQ(info.Fixed()->productVersionMS, (3u << 16) | 10u);
+    EXPECT_EQ(info.Fixed()->productVersionLS, 0u);
+
+    ASSERT_EQ(info.Translations().size(), 2u);
+    EXPECT_EQ(info.Translations()[0].language, 0x0409);
+    EXPECT_EQ(info.Translations()[0].codePage, 0x04B0);
+    EXPECT_EQ(info.Translations()[1].language, 0x0407);
+    EXPECT_EQ(info.Translations()[1].codePage, 0x04E4);
+
+    EXPECT_EQ(StringOf(info, "\\StringFileInfo\\040904B0\\CompanyName"), "Example Tools");
+    EXPECT_EQ(StringOf(info, "\\StringFileInfo\\040904b0\\fileversion"), "3.10.40000.5");
+    EXPECT_EQ(StringOf(info, "\\StringFileInfo\\040704E4\\FileDescription"), "Versionsbeispiel");
+    // Single-byte text: Latin-1 characters stay, the others become '?'.
+    EXPECT_EQ(StringOf(info, "\\StringFileInfo\\040904B0\\LegalCopyright"), "\xA9 2024 Example, ?");
+    EXPECT_EQ(StringOf(info, "\\StringFileInfo\\040904B0\\OLESelfRegister"), "");
+    EXPECT_EQ(StringOf(info, "\\StringFileInfo\\040704E4\\CompanyName"), "<none>");
+    EXPECT_EQ(StringOf(info, "\\StringFileInfo\\040904E4\\CompanyName"), "<none>");
+}
+
+TEST(VersionInfo, OurStampedProgramAndModules) {
+    pextest::TestMachine m;
+    VersionInfo host;
+    ASSERT_TRUE(plat::ver::Read(AppFolder() + "pexupdate", &host));
+    ASSERT_NE(host.Fixed(), nullptr);
+    EXPECT_EQ(host.Fixed()->fileVersionMS, (PEX_VERSION_MAJOR << 16) | PEX_VERSION_MINOR);
+    EXPECT_EQ(host.Fixed()->fileVersionLS, (PEX_VERSION_BUILD << 16) | PEX_VERSION_REVISION);
+    EXPECT_EQ(host.Fixed()->productVersionMS, host.Fixed()->fileVersionMS);
+    ASSERT_EQ(host.Translations().size(), 1u);
+    EXPECT_EQ(host.Translations()[0].language, 0x0409);
+    EXPECT_EQ(host.Translations()[0].codePage, 0x04E4);
+    EXPECT_EQ(StringOf(host, "\\StringFileInfo\\040904E4\\CompanyName"), "Vantric");
+    EXPECT_EQ(StringOf(host, "\\StringFileInfo\\040904E4\\FileDescription"), "Vantric Update Host");
+    EXPECT_EQ(StringOf(host, "\\StringFileInfo\\040904E4\\FileVersion"), PEX_VERSION_TEXT);
+    EXPECT_EQ(StringOf(host, "\\StringFileInfo\\040904E4\\ProductVersion"), PEX_VERSION_TEXT);
+    EXPECT_EQ(StringOf(host, "\\StringFileInfo\\040904E4\\OriginalFilename"), "pexupdate");
+
+    VersionInfo selfReg, noSelfReg;
+    ASSERT_TRUE(plat::ver::Read(AppFolder() + "PexSelfReg.dll", &selfReg));
+    ASSERT_TRUE(plat::ver::Read(AppFolder() + "PexNoSelfReg.dll", &noSelfReg));
+    EXPECT_EQ(StringOf(selfReg, "\\StringFileInfo\\040904E4\\OLESelfRegister"), "");
+    EXPECT_EQ(StringOf(noSelfReg, "\\StringFileInfo\\040904E4\\OLESelfRegister"), "<none>");
+    EXPECT_EQ(StringOf(selfReg, "\\StringFileInfo\\040904E4\\OriginalFilename"), "PexSelfReg.dll");
+}
+
+TEST(VersionInfo, FilesWithoutVersionInformation) {
+    pextest::TestMachine m;
+    VersionInfo info;
+    EXPECT_FALSE(plat::ver::Read(AppFolder() + "PexNoVersion.dll", &info));
+    EXPECT_EQ(plat::LastError(), plat::ver::kErrorResourceTypeNotFound);
+    m.WriteFile("C:\\notes.txt", "MZ is not enough");
+    EXPECT_FALSE(plat::ver::Read("C:\\notes.txt", &info));
+    EXPECT_EQ(plat::LastError(), plat::ver::kErrorResourceDataNotFound);
+    EXPECT_FALSE(plat::ver::Read("C:\\missing.dll", &info));
+    EXPECT_EQ(plat::LastError(), 2u);
+}
+
+TEST(VersionInfo, DamagedBlocksAreRejectedNotRead) {
+    pextest::TestMachine m;
+    std::string block;
+    ASSERT_TRUE(plat::ver::ReadBlock(Fixture(), &block));
+    std::string file;
+    ASSERT_TRUE(plat::files::ReadAll(Fixture(), &file));
+    VersionInfo info;
+    // Every truncation of the block and of the file: a clean refusal or a partial result,
+    // never a read outside the bytes (the sanitizer build checks that).
+    for (std::size_t n = 0; n < block.size(); ++n) info.Parse(block.substr(0, n));
+    EXPECT_FALSE(info.Parse(block.substr(0, 5)));
+    for (std::size_t n = 0; n < file.size(); n += 7) {
+        m.WriteFile("C:\\cut.dll", file.substr(0, n));
+        std::string cut;
+        plat::ver::ReadBlock("C:\\cut.dll", &cut);
+    }
+}
+
+}  // namespace
