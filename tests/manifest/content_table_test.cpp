@@ -173,23 +173,29 @@ TEST_F(ContentTableFile, AFileThatCannotBeOpenedGivesItsWindowsError) {
     EXPECT_EQ(static_cast<std::int32_t>(0x80070003u), table.LoadFromFile("C:\\no\\such.csv"));
 }
 
-// A save that fails at any step leaves the previous file byte for byte and reports the
-// Windows error to the caller.
+// A save that the platform refuses leaves the previous file byte for byte, no temporary file
+// beside it, and reports the Windows error to the caller.
 TEST_F(ContentTableFile, AFailedSaveKeepsTheOldFile) {
+    const std::string path = "C:\\Pex\\content.csv";
     const std::string old = "A,B\n1,2\n";
-    machine_.WriteFile("C:\\Pex\\content.csv", old);
-    CContentTable table = Loaded("A,B\r\n3,4\r\n5,6\r\n");
-    for (plat::fault::Op op : {plat::fault::Op::Write, plat::fault::Op::Rename}) {
-        plat::fault::Clear();
-        plat::fault::FailNth(op, 1, plat::kErrorDiskFull, true);
+    machine_.WriteFile(path, old);
+    const CContentTable table = Loaded("A,B\r\n3,4\r\n5,6\r\n");
+    const auto expectRefused = [&](std::uint32_t code) {
         try {
-            table.SaveToFile("C:\\Pex\\content.csv");
+            table.SaveToFile(path);
             ADD_FAILURE() << "the save did not fail";
         } catch (const plat::CFileException& e) {
-            EXPECT_EQ(plat::kErrorDiskFull, e.OsError());
+            EXPECT_EQ(code, e.OsError());
         }
-        EXPECT_EQ(old, machine_.ReadFile("C:\\Pex\\content.csv"));
-    }
+        EXPECT_EQ(old, machine_.ReadFile(path));
+        EXPECT_EQ(1u, plat::files::Find("C:\\Pex\\*").size());
+    };
+    plat::fault::FailNth(plat::fault::Op::Write, 1, plat::kErrorDiskFull);
+    expectRefused(plat::kErrorDiskFull);
+    plat::fault::Clear();
+
+    ASSERT_TRUE(plat::files::SetAttributes(path, plat::files::kAttrReadOnly));
+    expectRefused(plat::kErrorAccessDenied);
 }
 
 }  // namespace
