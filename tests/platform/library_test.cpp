@@ -5,12 +5,15 @@
 
 #include <gtest/gtest.h>
 
+#include <cstdint>
+#include <cstdlib>
 #include <filesystem>
 #include <string>
 
 #include "platform/errors.h"
 #include "platform/files.h"
 #include "platform/paths.h"
+#include "platform/registry.h"
 #include "tests/support/test_machine.h"
 
 namespace {
@@ -69,6 +72,31 @@ TEST(Library, ExportsAndTheUndecoratedFallback) {
     EXPECT_EQ(plat::LastError(), 127u);
     // Only the module's own exports count, not those of what it links against.
     EXPECT_EQ(plat::lib::FindExport(lib.get(), "malloc"), nullptr);
+}
+
+TEST(Library, SelfRegisteringModuleRuns) {
+    pextest::TestMachine m;
+    // The module carries its own copy of the platform, which finds the machine as a child
+    // process would: through PEX_MACHINE.
+    setenv("PEX_MACHINE", m.Root().c_str(), 1);
+    Library lib(plat::lib::Load("PexSelfReg.dll"));
+    ASSERT_TRUE(lib);
+    auto reg = reinterpret_cast<std::int32_t (*)()>(plat::lib::FindExport(lib.get(), "DllRegisterServer"));
+    ASSERT_NE(reg, nullptr);
+    EXPECT_EQ(reg(), 0);
+    lib.Reset();
+    unsetenv("PEX_MACHINE");
+
+    plat::reg::Key key;
+    ASSERT_EQ(plat::reg::OpenKey(plat::reg::kLocalMachine, "Software\\Vantric\\Test", plat::reg::kKeyRead,
+                                 key.out()),
+              0);
+    std::uint32_t value = 0, size = sizeof value, type = 0;
+    ASSERT_EQ(plat::reg::QueryValue(key.get(), "Registered", &type, reinterpret_cast<std::uint8_t*>(&value),
+                                    &size),
+              0);
+    EXPECT_EQ(type, plat::reg::kRegDword);
+    EXPECT_EQ(value, 1u);
 }
 
 TEST(Library, LoadFailures) {
