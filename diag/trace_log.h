@@ -8,7 +8,8 @@
 #include "platform/sync.h"
 
 // The open log file and its mutex. Every file operation waits at most 500 ms for the mutex and
-// does nothing when the wait fails.
+// does nothing when the wait fails (returning false). The mutex is recursive, so Append may hold
+// it around the seek and the write, which take it again.
 class TraceFile {
 public:
     TraceFile();
@@ -16,10 +17,14 @@ public:
     TraceFile(const TraceFile&) = delete;
     TraceFile& operator=(const TraceFile&) = delete;
 
-    bool Open(const std::string& name);  // read/write, shared, open-or-create, content kept
-    bool Close();
+    // Read/write, shared for reading and writing with other openers, created when missing,
+    // existing content kept. A handle still open is closed first.
+    bool Open(const std::string& name);
+    bool Close();  // true when no handle is left open
     bool SeekToEnd();
-    bool Write(const std::string& text);   // converts bare LF to CR LF
+    // Writes the text, every line feed not preceded by a carriage return as CR LF, in pieces
+    // (the text up to each line feed, then the line end). Stops at the first failing piece.
+    bool Write(const std::string& text);
     bool Append(const std::string& text);  // seek to end and write, mutex held once for both
     bool IsOpen() const;
 
@@ -30,17 +35,27 @@ private:
 
 class TraceLog {
 public:
+    // A non-empty name is stored and switches fileOutput on.
     explicit TraceLog(const std::string& fileName = std::string());
 
+    // Opens the file for appending; false (and fileOutput off) when the name is empty or the
+    // file cannot be opened.
     bool Open();
-    void Close();
-    void Delete();
+    void Close();   // closes the file if open
+    void Delete();  // Close, then delete the file
+    // Close, copy the file to the same name with the extension ".bak" (replacing an older
+    // backup), then delete the file whether or not the copy succeeded.
     void Backup();
-    void SetSubstitution(const std::string& search, const std::string& replacement);
+    // Every occurrence of search in a line becomes replacement; an empty search disables it. A
+    // replacement that contains the search text would never finish, so such a pair is refused
+    // (false) and substitution is switched off.
+    bool SetSubstitution(const std::string& search, const std::string& replacement);
     void SetFileName(const std::string& fileName);  // non-empty switches fileOutput on
     const std::string& FileName() const { return fileName_; }
+    bool IsOpen() const { return isOpen_; }
 
-    // Builds and writes one line (the body of TRACE).
+    // Builds and writes one line (the body of TRACE): stamp, message, line feed, substitution,
+    // then open if needed, append, and close unless keepOpen.
     void Write(const std::string& message);
 
     bool enabled = true;
@@ -50,14 +65,19 @@ public:
     bool keepOpen = false;
 
 private:
+    std::string BuildLine(const std::string& message) const;
+    void Output(const std::string& line);
+
     std::string fileName_;
     TraceFile file_;
     bool isOpen_ = false;
     std::string search_, replacement_;
 };
 
-// The process-wide log that every part of the library writes to.
+// The process-wide log that every part of the library writes to. It is constructed before the
+// module's other static objects, so the application object's load hook can use it.
 extern TraceLog g_TraceLog;
 
-// Formats printf-style and writes one line to the log; never throws.
+// Formats printf-style (no length limit) and writes one line to the log; never throws: a line
+// whose building or writing fails is lost.
 void TRACE(TraceLog& log, const char* format, ...) __attribute__((format(printf, 2, 3)));

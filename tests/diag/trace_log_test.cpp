@@ -1,0 +1,147 @@
+// The trace log as support staff read it: stamped lines with CR LF ends, the substitution pair,
+// appends that live with other openers, and the rotation to ".bak" at start-up.
+#include "diag/trace_log.h"
+
+#include <gtest/gtest.h>
+
+#include <regex>
+
+#include "diag/trace_startup.h"
+#include "platform/errors.h"
+#include "platform/fault.h"
+#include "platform/files.h"
+#include "tests/support/test_machine.h"
+#include "tests/support/trace_capture.h"
+
+namespace {
+
+using Lines = std::vector<std::string>;
+
+class TraceLogTest : public ::testing::Test {
+protected:
+    void TearDown() override { plat::fault::Clear(); }
+
+    pextest::TestMachine m;
+    pextest::TraceCapture trace;
+};
+
+TEST_F(TraceLogTest, LineStartsWithTheLocalTimeStamp) {
+    TRACE(g_TraceLog, "CFile_: Apply %d", 7);
+    std::regex line(R"(\d{4}/\d{2}/\d{2} - \d{2}:\d{2}:\d{2}\.\d{3} - CFile_: Apply 7\r\n)");
+    EXPECT_TRUE(std::regex_match(trace.Bytes(), line)) << trace.Bytes();
+    EXPECT_EQ(trace.Lines(), Lines{"CFile_: Apply 7"});
+}
+
+TEST_F(TraceLogTest, EveryLineEndsInExactlyOneCarriageReturnLineFeed) {
+    g_TraceLog.timestamps = false;
+    TRACE(g_TraceLog, "plain");
+    TRACE(g_TraceLog, "bare line feed\n");
+    TRACE(g_TraceLog, "already windows\r\n");
+    TRACE(g_TraceLog, "first\nsecond");
+    TRACE(g_TraceLog, "%s", "");
+    g_TraceLog.ensureNewline = false;
+    TRACE(g_TraceLog, "no end");
+    EXPECT_EQ(trace.Bytes(), "plain\r\nbare line feed\r\nalready windows\r\nfirst\r\nsecond\r\n\r\nno end");
+}
+
+TEST_F(TraceLogTest, LongMessageIsWrittenWhole) {
+    std::string text(20000, 'x');
+    text += "end";
+    TRACE(g_TraceLog, "[%s] %d%% %5.1f", text.c_str(), 42, 2.25);
+    EXPECT_EQ(trace.Lines(), Lines{"[" + text + "] 42%   2.2"});
+}
+
+TEST_F(TraceLogTest, SubstitutionReplacesEveryOccurrenceFromTheStartAgain) {
+    ASSERT_TRUE(g_TraceLog.SetSubstitution("secret", "***"));
+    TRACE(g_TraceLog, "a secret and a secret");
+    TRACE(g_TraceLog, "nothing here");
+    ASSERT_TRUE(g_TraceLog.SetSubstitution("ab", "a"));
+    TRACE(g_TraceLog, "aabb");  // aabb -> aab -> aa: each search starts at the beginning
+    ASSERT_TRUE(g_TraceLog.SetSubstitution("", "x"));
+    TRACE(g_TraceLog, "secret ab");
+    EXPECT_FALSE(g_TraceLog.SetSubstitution("a", "aa"));  // would never finish
+    TRACE(g_TraceLog, "a");
+    EXPECT_EQ(trace.Lines(), (Lines{"a *** and a ***", "nothing here", "aa", "secret ab", "a"}));
+}
+
+TEST_F(TraceLogTest, AppendsWhileAnotherProgramHoldsTheFileShared) {
+    plat::CFile other;
+    ASSERT_TRUE(other.Open(trace.Path(), plat::CFile::modeCreate | plat::CFile::modeReadWrite |
+                                             plat::CFile::shareDenyNone));
+    other.Write("other\r\n", 7);
+    TRACE(g_TraceLog, "one");
+    TRACE(g_TraceLog, "two");
+    EXPECT_EQ(trace.Lines(), (Lines{"other", "one", "two"}));
+}
+
+TEST_F(TraceLogTest, FileThatCannotBeOpenedSwitchesFileOutputOff) {
+    auto holder = std::make_unique<plat::CFile>();
+    ASSERT_TRUE(holder->Open(trace.Path(), plat::CFile::modeCreate | plat::CFile::modeWrite |
+                                               plat::CFile::shareExclusive));
+    TRACE(g_TraceLog, "lost");
+    EXPECT_FALSE(g_TraceLog.fileOutput);
+    holder.reset();
+    TRACE(g_TraceLog, "also lost: nothing reopens the file");
+    EXPECT_EQ(trace.Bytes(), "");
+}
+
+TEST_F(TraceLogTest, FailedWriteDropsTheRestOfThatLineOnly) {
+    g_TraceLog.timestamps = false;
+    plat::fault::FailNth(plat::fault::Op::Write, 2, plat::kErrorDiskFull);  // the first line end
+    TRACE(g_TraceLog, "kept\ndropped");
+    TRACE(g_TraceLog, "next");
+    EXPECT_EQ(trace.Bytes(), "keptnext\r\n");
+}
+
+TEST_F(TraceLogTest, KeepOpenHoldsTheFileBetweenLines) {
+    g_TraceLog.keepOpen = true;
+    TRACE(g_TraceLog, "burst 1");
+    EXPECT_TRUE(g_TraceLog.IsOpen());
+    TRACE(g_TraceLog, "burst 2");
+    g_TraceLog.keepOpen = false;
+    EXPECT_TRUE(g_TraceLog.IsOpen());
+    TRACE(g_TraceLog, "after");
+    EXPECT_FALSE(g_TraceLog.IsOpen());
+    EXPECT_EQ(trace.Lines(), (Lines{"burst 1", "burst 2", "after"}));
+}
+
+// Start-up configuration, on a log of its own as the library's start-up uses it.
+class TraceStartupTest : public ::testing::Test {
+protected:
+    static constexpr const char* kLogPath = "C:\\Program Files\\Vantric\\log\\pex_support_mendler.log";
+    static constexpr const char* kBakPath = "C:\\Program Files\\Vantric\\log\\pex_support_mendler.bak";
+
+    pextest::TestMachine m;
+    TraceLog log;
+};
+
+TEST_F(TraceStartupTest, PreviousLogBecomesTheBackupAndTheNewLogStartsEmpty) {
+    m.WriteFile(kLogPath, "previous run\r\n");
+    m.WriteFile(kBakPath, "the run before\r\n");
+    ConfigureTraceLog(log, "C:\\Program Files\\Vantric\\Mendler.dll");
+
+    EXPECT_EQ(log.FileName(), kLogPath);
+    EXPECT_EQ(m.ReadFile(kBakPath), "previous run\r\n");
+    EXPECT_FALSE(plat::files::Exists(kLogPath));
+    TRACE(log, "Vantric Software Update - Mendler (%s)", "Version 02.01.00.17");
+    EXPECT_EQ(pextest::TraceLines(m.ReadFile(kLogPath)), Lines{"Vantric Software Update - Mendler (Version 02.01.00.17)"});
+}
+
+TEST_F(TraceStartupTest, CreatesTheLogFolderWithItsParentsAndInstallsTheSubstitution) {
+    ConfigureTraceLog(log, "C:\\Deep\\Er\\Mendler.dll");
+    EXPECT_EQ(log.FileName(), "C:\\Deep\\Er\\log\\pex_support_mendler.log");
+    EXPECT_TRUE(log.fileOutput);
+    EXPECT_FALSE(log.keepOpen);
+    TRACE(log, "ProgID: [%s.Agent]", kTraceHiddenWord);
+    EXPECT_EQ(pextest::TraceLines(m.ReadFile(log.FileName())),
+              Lines{"ProgID: [" + std::string(kTraceHiddenWordToken) + ".Agent]"});
+}
+
+TEST_F(TraceStartupTest, WithoutAModulePathTheLogIsAtTheDriveRoot) {
+    ConfigureTraceLog(log, "");
+    EXPECT_EQ(log.FileName(), "c:\\log.log");
+    ConfigureTraceLog(log, "C:\\" + std::string(1100, 'a') + "\\Mendler.dll");
+    EXPECT_EQ(log.FileName(), "c:\\log.log");
+}
+
+}  // namespace
