@@ -96,17 +96,18 @@ long QueuePendingRename(const PendingRename& op) {
     return WritePendingRenames(queue);
 }
 
-std::vector<RenameOutcome> CarryOutPendingRenames() {
-    std::vector<RenameOutcome> outcomes;
+bool CarryOutPendingRenames(std::vector<RenameOutcome>* outcomes) {
+    outcomes->clear();
     std::vector<PendingRename> queue, failed;
-    if (!ReadPendingRenames(&queue)) return outcomes;
+    if (!ReadPendingRenames(&queue)) return false;
     for (const PendingRename& op : queue) {
         bool ok = op.to.empty() ? files::Remove(op.from) : files::Rename(op.from, op.to, op.replace);
-        outcomes.push_back({op, ok ? 0u : LastError()});
+        outcomes->push_back({op, ok ? 0u : LastError()});
         if (!ok) failed.push_back(op);
     }
-    WritePendingRenames(failed);
-    return outcomes;
+    long rc = WritePendingRenames(failed);
+    if (rc != 0) SetLastErrorCode(static_cast<std::uint32_t>(rc));
+    return rc == 0;
 }
 
 }  // namespace plat::setup

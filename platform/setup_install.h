@@ -54,7 +54,8 @@ struct RenameOutcome {
 };
 // Carries the queue out in order, as Windows does at restart: renames (or deletes), and
 // stores again only the operations that failed, so a staged file is never lost. Nothing is
-// deleted unless the queue asked for it.
-std::vector<RenameOutcome> CarryOutPendingRenames();
+// deleted unless the queue asked for it. False and the last error when the queue cannot be
+// read or stored again; outcomes then holds what was done.
+bool CarryOutPendingRenames(std::vector<RenameOutcome>* outcomes);
 
 }  // namespace plat::setup
