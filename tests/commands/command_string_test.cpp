@@ -1,0 +1,114 @@
+// The list rules of CommandString, with executors that only record their calls: which items
+// reach which executor, the TRY- rule, the exception kinds and the trace lines.
+#include "commands/command_string.h"
+
+#include <gtest/gtest.h>
+
+#include <string>
+#include <vector>
+
+#include "platform/cfile.h"
+#include "tests/support/test_machine.h"
+#include "tests/support/trace_capture.h"
+
+namespace {
+
+using Lines = std::vector<std::string>;
+
+// Records "Executor(parameter)"; a parameter "text" throws a fixed message, "file" the file
+// exception, as the real executors do.
+class RecordingCommands : public CommandString {
+public:
+    static constexpr char kMessage[] = "boom";
+    RecordingCommands() : CommandString("C:\\App") {}
+    std::vector<std::string> calls;
+
+protected:
+    void ExecuteRun(std::string p) override { Record("Run", p); }
+    void ExecuteDel(std::string p) override { Record("Del", p); }
+    void ExecuteRegSvr(std::string p) override { Record("RegSvr", p); }
+    void ExecuteDelIfExists(std::string p) override { Record("DelIfExists", p); }
+    void ExecuteRegistry(std::string p) override { Record("Registry", p); }
+
+private:
+    void Record(const char* executor, const std::string& parameter) {
+        calls.push_back(std::string(executor) + "(" + parameter + ")");
+        if (parameter == "text") throw kMessage;
+        if (parameter == "file") throw plat::CFileException(5, "C:\\App\\x");
+    }
+};
+
+TEST(CommandString, EveryTagReachesItsExecutorWithTheTrimmedParameter) {
+    RecordingCommands commands;
+    EXPECT_TRUE(commands.Execute(
+        "[RUN] a b ;[DEL]\tb;[DELIFEXISTS]c;[REGSVR] d;[REGISTRY] e;"
+        "[try-run]f;[Try-Del]g;[TRY-DELIFEXISTS]h;[TRY-REGSVR]i;[TRY-REGISTRY]j;[RUN]"));
+    EXPECT_EQ(commands.calls,
+              (Lines{"Run(a b)", "Del(b)", "DelIfExists(c)", "RegSvr(d)", "Registry(e)", "Run(f)",
+                     "Del(g)", "DelIfExists(h)", "RegSvr(i)", "Registry(j)", "Run()"}));
+}
+
+TEST(CommandString, TagsMatchOnlyAtTheStartAndOverTheirFullLength) {
+    RecordingCommands commands;
+    EXPECT_TRUE(commands.Execute("x[DEL] a;[DELIF] b;[DEL]IFEXISTS] c;[DELIFEXISTS]d;[TRY-]e;[RU"));
+    EXPECT_EQ(commands.calls, (Lines{"Del(IFEXISTS] c)", "DelIfExists(d)"}));
+}
+
+TEST(CommandString, TracesEveryItemAndSkipsUnknownOnesSilently) {
+    pextest::TestMachine m;
+    pextest::TraceCapture trace;
+    RecordingCommands commands;
+    EXPECT_TRUE(commands.Execute("[run] one;; [NOPE] two ; \n"));
+    EXPECT_EQ(trace.Lines(), (Lines{
+        "CommandString::Execute 3 items in command list",
+        "CommandString::Execute, command is [run] one",
+        "Command [[RUN]] Complete.",
+        "CommandString::Execute, command is ",
+        "CommandString::Execute, command is [NOPE] two",
+        "CommandString::Execute returning 1",
+    }));
+}
+
+TEST(CommandString, TryCommandsContinueButTheResultIsFalse) {
+    pextest::TestMachine m;
+    pextest::TraceCapture trace;
+    RecordingCommands commands;
+    EXPECT_FALSE(commands.Execute("[TRY-REGSVR] text;[try-del] file;[DEL] next"));
+    EXPECT_EQ(commands.calls, (Lines{"RegSvr(text)", "Del(file)", "Del(next)"}));
+    EXPECT_EQ(trace.Lines(), (Lines{
+        "CommandString::Execute 3 items in command list",
+        "CommandString::Execute, command is [TRY-REGSVR] text",
+        "Ignoring Exception [boom] from Command [[TRY-REGSVR]].",
+        "CommandString::Execute, command is [try-del] file",
+        "Ignoring unknown Exception from Command [[TRY-DEL]].",
+        "CommandString::Execute, command is [DEL] next",
+        "Command [[DEL]] Complete.",
+        "CommandString::Execute returning 0",
+    }));
+}
+
+TEST(CommandString, AFailingCommandWithoutTryStopsTheListAndRethrows) {
+    {
+        pextest::TestMachine m;
+        pextest::TraceCapture trace;
+        RecordingCommands commands;
+        try {
+            commands.Execute("[REGISTRY] text;[RUN] never");
+            FAIL() << "no exception";
+        } catch (const char* message) {
+            EXPECT_EQ(message, RecordingCommands::kMessage);  // the same object, not a copy
+        }
+        EXPECT_EQ(commands.calls, (Lines{"Registry(text)"}));
+        EXPECT_EQ(trace.Lines().back(), "Throwing Exception [boom] from Command [[REGISTRY]].");
+    }
+    {
+        pextest::TestMachine m;
+        pextest::TraceCapture trace;
+        RecordingCommands commands;
+        EXPECT_THROW(commands.Execute("[delifexists] file;[RUN] never"), plat::CFileException);
+        EXPECT_EQ(commands.calls, (Lines{"DelIfExists(file)"}));
+        EXPECT_EQ(trace.Lines().back(), "Throwing unknown Exception from Command [[DELIFEXISTS]].");
+    }
+}
+
+}  // namespace
