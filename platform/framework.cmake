@@ -14,10 +14,7 @@ add_library(pex_framework STATIC
   ${CMAKE_CURRENT_SOURCE_DIR}/${PEX_FRAMEWORK_BACKEND}/cfile.cpp
   ${CMAKE_CURRENT_SOURCE_DIR}/${PEX_FRAMEWORK_BACKEND}/sync.cpp)
 # Paths, errors and the fault plan come from the base; the application profile from the registry.
-target_link_libraries(pex_framework PUBLIC pex_platform_base)
-if(TARGET pex_registry)
-  target_link_libraries(pex_framework PUBLIC pex_registry)
-endif()
+target_link_libraries(pex_framework PUBLIC pex_platform_base pex_registry)
 if(NOT WIN32)
   find_package(Threads REQUIRED)
   target_link_libraries(pex_framework PUBLIC Threads::Threads)
