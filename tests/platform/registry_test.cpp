@@ -1,1 +1,266 @@
+// The registry of the machine: the codes of the Windows calls, names and order, the
+// read-only registry, several processes, batches and the fault plan.
+#include "platform/registry.h"
+
 #include <gtest/gtest.h>
+#include <sys/stat.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <string>
+#include <vector>
+
+#include "platform/errors.h"
+#include "platform/fault.h"
+#include "platform/machine.h"
+#include "platform/reg_transaction.h"
+#include "tests/support/test_machine.h"
+
+namespace reg = plat::reg;
+
+namespace {
+
+class RegistryTest : public ::testing::Test {
+protected:
+    void TearDown() override { plat::fault::Clear(); }
+
+    reg::Key Create(const std::string& path, std::uint32_t access = reg::kKeyAllAccess) {
+        reg::Key key;
+        EXPECT_EQ(0, reg::CreateKey(reg::kLocalMachine, path, access, key.out(), nullptr));
+        return key;
+    }
+    static long SetText(reg::HKey key, const std::string& name, const std::string& bytes) {
+        return reg::SetValue(key, name, reg::kRegSz,
+                             reinterpret_cast<const std::uint8_t*>(bytes.data()),
+                             static_cast<std::uint32_t>(bytes.size()));
+    }
+    static std::string Text(reg::HKey key, const std::string& name) {
+        std::uint8_t buffer[256];
+        std::uint32_t size = sizeof buffer;
+        if (reg::QueryValue(key, name, nullptr, buffer, &size) != 0) return "<missing>";
+        return std::string(reinterpret_cast<char*>(buffer), size);
+    }
+    static std::vector<std::string> SubKeys(reg::HKey key) {
+        std::vector<std::string> names;
+        char name[64];
+        std::uint32_t size = sizeof name;
+        for (std::uint32_t i = 0; reg::EnumKey(key, i, name, &size) == 0; ++i, size = sizeof name)
+            names.push_back(name);
+        return names;
+    }
+
+    pextest::TestMachine machine_;
+};
+
+TEST_F(RegistryTest, CreateReportsItsDispositionAndOpenFindsOnlyExistingKeys) {
+    reg::Key key;
+    std::uint32_t disposition = 0;
+    EXPECT_EQ(0, reg::CreateKey(reg::kLocalMachine, "Software\\Vantric\\Pex", reg::kKeyAllAccess,
+                                key.out(), &disposition));
+    EXPECT_EQ(reg::kCreatedNewKey, disposition);
+    EXPECT_EQ(0, reg::CreateKey(reg::kLocalMachine, "SOFTWARE\\vantric\\PEX", reg::kKeyAllAccess,
+                                key.out(), &disposition));
+    EXPECT_EQ(reg::kOpenedExistingKey, disposition);
+
+    EXPECT_EQ(0, reg::OpenKey(reg::kLocalMachine, "software\\VANTRIC", reg::kKeyRead, key.out()));
+    EXPECT_EQ(2, reg::OpenKey(reg::kLocalMachine, "Software\\Vantric\\Missing", reg::kKeyRead,
+                              key.out()));
+    EXPECT_EQ(2u, plat::LastError());
+    EXPECT_FALSE(key);
+    EXPECT_EQ(2, reg::OpenKey(reg::kLocalMachine, "No\\Such\\Parent", reg::kKeyRead, key.out()));
+    EXPECT_EQ(2, reg::OpenKey(reg::kCurrentUser, "Software\\Vantric", reg::kKeyRead, key.out()));
+}
+
+TEST_F(RegistryTest, SubkeysEnumerateInCaseInsensitiveOrderKeepingTheirCase) {
+    reg::Key parent = Create("Software\\Order");
+    for (const char* name : {"charlie", "Alpha", "bravo", "_under", "Zulu", "alpha2"}) {
+        reg::Key child;
+        ASSERT_EQ(0, reg::CreateKey(parent.get(), name, reg::kKeyAllAccess, child.out(), nullptr));
+    }
+    EXPECT_EQ((std::vector<std::string>{"_under", "Alpha", "alpha2", "bravo", "charlie", "Zulu"}),
+              SubKeys(parent.get()));
+
+    char name[64];
+    std::uint32_t size = sizeof name;
+    EXPECT_EQ(0, reg::EnumKey(parent.get(), 1, name, &size));
+    EXPECT_EQ(5u, size);  // the length, without the NUL
+    size = sizeof name;
+    EXPECT_EQ(259, reg::EnumKey(parent.get(), 6, name, &size));
+    EXPECT_EQ(259u, plat::LastError());
+    size = 3;
+    EXPECT_EQ(234, reg::EnumKey(parent.get(), 0, name, &size));
+
+    std::uint32_t subKeys = 0, values = 9;
+    EXPECT_EQ(0, reg::QueryInfoKey(parent.get(), &subKeys, &values));
+    EXPECT_EQ(6u, subKeys);
+    EXPECT_EQ(0u, values);
+}
+
+TEST_F(RegistryTest, ValueNamesMatchWithoutCaseAndKeepTheCaseTheyWereCreatedWith) {
+    reg::Key key = Create("Software\\Names");
+    ASSERT_EQ(0, SetText(key.get(), "ContentFileName", std::string("a.csv", 6)));
+    ASSERT_EQ(0, SetText(key.get(), "CONTENTFILENAME", std::string("b.csv", 6)));
+    EXPECT_EQ(std::string("b.csv", 6), Text(key.get(), "contentfilename"));
+
+    char name[64];
+    std::uint32_t nameSize = sizeof name, type = 0, dataSize = 0;
+    ASSERT_EQ(0, reg::EnumValue(key.get(), 0, name, &nameSize, &type, nullptr, &dataSize));
+    EXPECT_STREQ("ContentFileName", name);
+    EXPECT_EQ(reg::kRegSz, type);
+    EXPECT_EQ(6u, dataSize);
+    nameSize = sizeof name;
+    EXPECT_EQ(259, reg::EnumValue(key.get(), 1, name, &nameSize, nullptr, nullptr, nullptr));
+}
+
+TEST_F(RegistryTest, QueryValueGivesSizesAndTheBytesAsWritten) {
+    reg::Key key = Create("Software\\Sizes");
+    ASSERT_EQ(0, SetText(key.get(), "WithNul", std::string("abc", 4)));
+    ASSERT_EQ(0, SetText(key.get(), "WithoutNul", "abc"));
+    ASSERT_EQ(0, SetText(key.get(), "Empty", ""));
+
+    std::uint32_t type = 0, size = 0;
+    EXPECT_EQ(0, reg::QueryValue(key.get(), "WithNul", &type, nullptr, &size));
+    EXPECT_EQ(4u, size);
+    EXPECT_EQ(reg::kRegSz, type);
+    EXPECT_EQ("abc", Text(key.get(), "WithoutNul"));
+    EXPECT_EQ(0, reg::QueryValue(key.get(), "Empty", nullptr, nullptr, &size));
+    EXPECT_EQ(0u, size);
+
+    std::uint8_t small[2];
+    size = sizeof small;
+    EXPECT_EQ(234, reg::QueryValue(key.get(), "WithNul", &type, small, &size));
+    EXPECT_EQ(4u, size);
+    EXPECT_EQ(234u, plat::LastError());
+
+    EXPECT_EQ(2, reg::QueryValue(key.get(), "Missing", nullptr, nullptr, &size));
+    EXPECT_EQ(2, reg::DeleteValue(key.get(), "Missing"));
+    EXPECT_EQ(0, reg::DeleteValue(key.get(), "withnul"));
+    EXPECT_EQ(0u, plat::LastError());
+    EXPECT_EQ("<missing>", Text(key.get(), "WithNul"));
+}
+
+TEST_F(RegistryTest, AccessRightsAndKeyDeletionFollowWindows) {
+    Create("Software\\Vantric\\Pex\\Zendor32");
+    reg::Key readOnly;
+    ASSERT_EQ(0, reg::OpenKey(reg::kLocalMachine, "Software\\Vantric", reg::kKeyRead, readOnly.out()));
+    EXPECT_EQ(5, SetText(readOnly.get(), "x", "y"));
+    EXPECT_EQ(5u, plat::LastError());
+    EXPECT_EQ(5, reg::DeleteValue(readOnly.get(), "x"));
+    reg::Key child;
+    EXPECT_EQ(5, reg::CreateKey(readOnly.get(), "New", reg::kKeyAllAccess, child.out(), nullptr));
+    EXPECT_EQ(0, reg::CreateKey(readOnly.get(), "Pex", reg::kKeyAllAccess, child.out(), nullptr));
+
+    EXPECT_EQ(5, reg::DeleteKey(reg::kLocalMachine, "Software\\Vantric\\Pex"));
+    EXPECT_EQ(0, reg::DeleteKey(reg::kLocalMachine, "Software\\Vantric\\Pex\\Zendor32"));
+    EXPECT_EQ(2, reg::DeleteKey(reg::kLocalMachine, "Software\\Vantric\\Pex\\Zendor32"));
+    EXPECT_EQ(0, reg::DeleteKey(readOnly.get(), "Pex"));
+    EXPECT_EQ(5, reg::DeleteKey(reg::kCurrentUser, ""));  // a hive stays
+}
+
+TEST_F(RegistryTest, ClassesRootIsAViewOfTheMachineClasses) {
+    reg::Key viaView;
+    ASSERT_EQ(0, reg::CreateKey(reg::kClassesRoot, ".pex", reg::kKeyAllAccess, viaView.out(), nullptr));
+    ASSERT_EQ(0, SetText(viaView.get(), "", "Pex.File"));
+    reg::Key direct;
+    ASSERT_EQ(0, reg::OpenKey(reg::kLocalMachine, "Software\\Classes\\.PEX", reg::kKeyRead,
+                              direct.out()));
+    EXPECT_EQ("Pex.File", Text(direct.get(), ""));
+    EXPECT_EQ(std::vector<std::string>{".pex"}, SubKeys(reg::kClassesRoot));
+}
+
+TEST_F(RegistryTest, ARegistryThatCannotBeWrittenStillReads) {
+    reg::Key key = Create("Software\\Vantric");
+    ASSERT_EQ(0, SetText(key.get(), "DefaultPath", "C:\\Vantric"));
+    const std::string db = machine_.Root() + "/registry.db";
+    for (const std::string& path : {db, machine_.Root()}) {
+        struct stat st;
+        ASSERT_EQ(0, stat(path.c_str(), &st));
+        ASSERT_EQ(0, chmod(path.c_str(), st.st_mode & ~0222));
+        EXPECT_EQ(5, SetText(key.get(), "DefaultPath", "C:\\Other")) << path;
+        reg::Key child;
+        EXPECT_EQ(5, reg::CreateKey(key.get(), "New", reg::kKeyAllAccess, child.out(), nullptr));
+        EXPECT_EQ(5, reg::DeleteValue(key.get(), "DefaultPath"));
+        EXPECT_EQ("C:\\Vantric", Text(key.get(), "DefaultPath"));
+        reg::Key reopened;
+        EXPECT_EQ(0, reg::OpenKey(reg::kLocalMachine, "Software\\Vantric", reg::kKeyRead,
+                                  reopened.out()));
+        ASSERT_EQ(0, chmod(path.c_str(), st.st_mode));
+    }
+    EXPECT_EQ(0, SetText(key.get(), "DefaultPath", "C:\\Other"));
+}
+
+TEST_F(RegistryTest, ProcessesWritingAtOnceLoseNothing) {
+    Create("Software\\Shared");
+    constexpr int kProcesses = 3, kWrites = 40;
+    std::vector<pid_t> children;
+    for (int p = 0; p < kProcesses; ++p) {
+        pid_t pid = fork();
+        ASSERT_GE(pid, 0);
+        if (pid == 0) {
+            int failures = 0;
+            for (int i = 0; i < kWrites; ++i) {
+                std::string name = "p" + std::to_string(p) + "-" + std::to_string(i);
+                reg::Key own, shared;
+                failures += reg::CreateKey(reg::kLocalMachine, "Software\\Shared\\" + name,
+                                           reg::kKeyAllAccess, own.out(), nullptr) != 0;
+                failures += reg::OpenKey(reg::kLocalMachine, "Software\\Shared", reg::kKeyAllAccess,
+                                         shared.out()) != 0;
+                failures += SetText(shared.get(), name, name) != 0;
+            }
+            _exit(failures == 0 ? 0 : 1);
+        }
+        children.push_back(pid);
+    }
+    for (pid_t pid : children) {
+        int status = 0;
+        ASSERT_EQ(pid, waitpid(pid, &status, 0));
+        EXPECT_TRUE(WIFEXITED(status) && WEXITSTATUS(status) == 0);
+    }
+    reg::Key shared = Create("Software\\Shared");
+    std::uint32_t subKeys = 0, values = 0;
+    ASSERT_EQ(0, reg::QueryInfoKey(shared.get(), &subKeys, &values));
+    EXPECT_EQ(std::uint32_t(kProcesses * kWrites), subKeys);
+    EXPECT_EQ(std::uint32_t(kProcesses * kWrites), values);
+}
+
+TEST_F(RegistryTest, TheFaultPlanFailsTheChosenRegistryWrite) {
+    reg::Key key = Create("Software\\Faults");
+    plat::fault::FailNth(plat::fault::Op::RegWrite, 2, plat::kErrorDiskFull);
+    EXPECT_EQ(0, SetText(key.get(), "first", "1"));
+    EXPECT_EQ(112, SetText(key.get(), "second", "2"));
+    EXPECT_EQ(112u, plat::LastError());
+    EXPECT_EQ(0, SetText(key.get(), "third", "3"));
+    EXPECT_EQ("<missing>", Text(key.get(), "second"));
+    EXPECT_EQ("3", Text(key.get(), "third"));
+}
+
+TEST_F(RegistryTest, ABatchTakesEffectWholeOrNotAtAll) {
+    reg::Key key = Create("Software\\Batch");
+    {
+        reg::Transaction batch;
+        ASSERT_EQ(0, batch.Status());
+        ASSERT_EQ(0, SetText(key.get(), "dropped", "x"));
+        reg::Key child;
+        ASSERT_EQ(0, reg::CreateKey(key.get(), "DroppedKey", reg::kKeyAllAccess, child.out(), nullptr));
+    }
+    EXPECT_EQ("<missing>", Text(key.get(), "dropped"));
+    EXPECT_TRUE(SubKeys(key.get()).empty());
+    {
+        reg::Transaction batch;
+        ASSERT_EQ(0, SetText(key.get(), "kept", "y"));
+        EXPECT_EQ(0, batch.Commit());
+    }
+    EXPECT_EQ("y", Text(key.get(), "kept"));
+}
+
+TEST_F(RegistryTest, HandlesBelongToTheirMachine) {
+    reg::Key key = Create("Software\\Vantric");
+    {
+        pextest::TestMachine other;
+        reg::Key there;
+        EXPECT_EQ(2, reg::OpenKey(reg::kLocalMachine, "Software\\Vantric", reg::kKeyRead, there.out()));
+        EXPECT_EQ(6, SetText(key.get(), "stale", "x"));
+    }
+}
+
+}  // namespace
