@@ -1,4 +1,4 @@
-// The recursive timed mutex and the clocks that the trace log uses.
+// The recursive timed mutex that guards the trace file.
 #include "platform/sync.h"
 
 #include <gtest/gtest.h>
@@ -38,17 +38,6 @@ TEST(TimedMutexTest, WaitFailsWhileAnotherThreadHoldsIt) {
     holder.join();
     EXPECT_TRUE(mutex.Lock(500));
     mutex.Unlock();
-}
-
-TEST(LocalTimeTest, FieldsAreCalendarValues) {
-    plat::LocalTimeStamp t = plat::LocalTime();
-    EXPECT_GE(t.year, 2000);
-    EXPECT_TRUE(t.month >= 1 && t.month <= 12);
-    EXPECT_TRUE(t.day >= 1 && t.day <= 31);
-    EXPECT_TRUE(t.hour >= 0 && t.hour <= 23);
-    EXPECT_TRUE(t.minute >= 0 && t.minute <= 59);
-    EXPECT_TRUE(t.second >= 0 && t.second <= 60);
-    EXPECT_TRUE(t.millisecond >= 0 && t.millisecond <= 999);
 }
 
 }  // namespace
