@@ -5,3 +5,12 @@ pex_add_test(registry_test
 pex_add_test(reg_file_test
   SOURCES ${CMAKE_CURRENT_SOURCE_DIR}/platform/reg_file_test.cpp
   LIBS pex_registry)
+
+# `pexupdate reg`, run as a program.
+if(TARGET pexupdate)
+  pex_add_test(reg_command_test
+    SOURCES ${CMAKE_CURRENT_SOURCE_DIR}/tools/reg_command_test.cpp
+    LIBS pex_registry)
+  target_compile_definitions(reg_command_test PRIVATE PEXUPDATE_PATH="$<TARGET_FILE:pexupdate>")
+  add_dependencies(reg_command_test pexupdate)
+endif()

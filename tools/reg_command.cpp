@@ -296,11 +296,20 @@ const char kIntro[] =
 
 bool WantsHelp(const std::string& arg) { return arg == "--help" || arg == "-h" || arg == "/?"; }
 
+void PrintHelp(FILE* out) {
+    std::fputs(kIntro, out);
+    for (const Verb& v : kVerbs) std::fprintf(out, "%s\n", v.usage);
+}
+
 int RunReg(const std::vector<std::string>& args) {
-    if (args.empty() || WantsHelp(args[0])) {
-        std::fputs(kIntro, args.empty() ? stderr : stdout);
-        for (const Verb& v : kVerbs) std::fprintf(args.empty() ? stderr : stdout, "%s\n", v.usage);
-        return args.empty() ? 2 : 0;
+    if (args.empty()) {
+        std::fprintf(stderr, "ERROR: Invalid syntax: name an operation.\n");
+        PrintHelp(stderr);
+        return 2;
+    }
+    if (WantsHelp(args[0])) {
+        PrintHelp(stdout);
+        return 0;
     }
     for (const Verb& verb : kVerbs) {
         if (!reg::NamesEqual(args[0], verb.name)) continue;
