@@ -231,8 +231,7 @@ bool Parser::HexData(const std::string& text, RegFileEntry* entry, std::string* 
         return false;
     *why = "malformed hex bytes (expected two-digit hexadecimal numbers separated by commas)";
     if (!HexList(text.substr(colon + 1), &entry->data)) return false;
-    bool text16 = entry->type == kRegSz || entry->type == kRegExpandSz || entry->type == kRegMultiSz;
-    if (unicode_ && text16) entry->data = FromUtf16(entry->data);
+    if (unicode_ && IsTextType(entry->type)) entry->data = FromUtf16(entry->data);
     return true;
 }
 

@@ -48,7 +48,8 @@ std::string HexForm(std::string line, const std::string& bytes) {
 
 std::string ValueEntry(const Value& v) {
     std::string line = (v.name.empty() ? std::string("@") : Quote(v.name)) + "=";
-    if (v.type == kRegSz && PlainText(v.data)) return line + Quote(v.data.substr(0, v.data.size() - 1));
+    if (v.type == kRegSz && PlainText(v.data))
+        return line + Quote(v.data.substr(0, v.data.size() - 1));
     if (v.type == kRegDword && v.data.size() == 4) {
         unsigned value = 0;
         for (size_t i = 4; i-- > 0;) value = (value << 8) | static_cast<unsigned char>(v.data[i]);
@@ -59,8 +60,7 @@ std::string ValueEntry(const Value& v) {
     if (v.type == kRegBinary) return HexForm(line + "hex:", v.data);
     char form[24];
     std::snprintf(form, sizeof form, "hex(%x):", v.type);
-    bool text16 = v.type == kRegSz || v.type == kRegExpandSz || v.type == kRegMultiSz;
-    return HexForm(line + form, text16 ? ToUtf16(v.data) : v.data);
+    return HexForm(line + form, IsTextType(v.type) ? ToUtf16(v.data) : v.data);
 }
 
 long ExportKey(HKey key, const KeyPath& path, std::string* text) {

@@ -3,6 +3,8 @@
 
 #include <cstdint>
 
+#include "platform/registry.h"
+
 namespace plat::reg {
 
 namespace {
@@ -72,6 +74,10 @@ std::string DecodeRegText(const std::string& fileBytes) {
     return utf8Mark ? fileBytes.substr(3) : fileBytes;
 }
 
+bool IsTextType(std::uint32_t type) {
+    return type == kRegSz || type == kRegExpandSz || type == kRegMultiSz;
+}
+
 std::string ToUtf16(const std::string& text) {
     std::string bytes;
     bytes.reserve(text.size() * 2);
@@ -87,7 +93,8 @@ std::string FromUtf16(const std::string& bytes) {
     text.reserve(bytes.size() / 2 + 1);
     auto unitAt = [&](size_t i) {
         std::uint32_t unit = static_cast<unsigned char>(bytes[i]);
-        if (i + 1 < bytes.size()) unit |= static_cast<std::uint32_t>(static_cast<unsigned char>(bytes[i + 1])) << 8;
+        if (i + 1 < bytes.size())
+            unit |= static_cast<std::uint32_t>(static_cast<unsigned char>(bytes[i + 1])) << 8;
         return unit;
     };
     for (size_t i = 0; i < bytes.size(); i += 2) {

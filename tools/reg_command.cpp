@@ -45,7 +45,8 @@ int Usage(const char* message) {
 
 int Failure(long code) {
     if (code == plat::kErrorFileNotFound)
-        std::fprintf(stderr, "ERROR: The system was unable to find the specified registry key or value.\n");
+        std::fprintf(stderr, "ERROR: The system was unable to find the specified registry key"
+                             " or value.\n");
     else if (code == plat::kErrorAccessDenied)
         std::fprintf(stderr, "ERROR: Access is denied.\n");
     else
@@ -168,8 +169,8 @@ int Add(const Args& a) {
         return Failure(code);
     if (a.hasV || a.ve) {
         bool exists = reg::QueryValue(k.get(), a.v, nullptr, nullptr, nullptr) == 0;
-        if (exists && !a.f && !Confirm("Value " + (a.ve ? std::string("(Default)") : a.v) + " exists, overwrite"))
-            return 1;
+        std::string shown = a.ve ? std::string("(Default)") : a.v;
+        if (exists && !a.f && !Confirm("Value " + shown + " exists, overwrite")) return 1;
         long code = reg::SetValue(k.get(), a.v, type,
                                   reinterpret_cast<const std::uint8_t*>(data.data()),
                                   static_cast<std::uint32_t>(data.size()));
@@ -227,7 +228,8 @@ int Export(const Args& a) {
     int rc = 0;
     if (!KeyArg(a, 2, &key, &rc)) return rc;
     std::string file = HostFile(a.positional[1]);
-    if (!a.y && std::ifstream(file).good() && !Confirm("File " + a.positional[1] + " already exists. Overwrite"))
+    bool exists = std::ifstream(file).good();
+    if (exists && !a.y && !Confirm("File " + a.positional[1] + " already exists. Overwrite"))
         return 1;
     std::string bytes;
     if (long code = reg::ExportRegFile(key, &bytes)) return Failure(code);
@@ -323,6 +325,6 @@ int RunReg(const std::vector<std::string>& args) {
 }
 
 const pextool::CommandRegistrar kRegister(
-    {"reg", "query and change the machine's registry (query, add, delete, export, import)", RunReg});
+    {"reg", "query and change the registry (query, add, delete, export, import)", RunReg});
 
 }  // namespace

@@ -83,7 +83,8 @@ TEST_F(RegFileTest, ExportThenImportReproducesEveryTypeAndOddBytes) {
     Set(key, "None", reg::kRegNone, std::string("\0\x01", 2));
     Set(key, "Qword", 11, std::string("\x01\x02\x03\x04\x05\x06\x07\x08", 8));
     Set(key + "\\Nested\\Deeper", "\xC4name", reg::kRegSz, std::string("\xE4\0", 2));
-    Set(std::string(kProducts) + "\\Orlandel", "DefaultPath", reg::kRegSz, std::string("C:\\\0", 4));
+    Set(std::string(kProducts) + "\\Orlandel", "DefaultPath", reg::kRegSz,
+        std::string("C:\\\0", 4));
 
     std::string file;
     ASSERT_EQ(0, reg::ExportRegFile(Path(kProducts), &file));
@@ -170,8 +171,8 @@ TEST_F(RegFileTest, ImportReadsUtf16Utf8AndSingleByteFiles) {
         "Windows Registry Editor Version 5.00\r\n\r\n"
         "[HKEY_CURRENT_USER\\Software\\Vantric]\r\n"
         "\"Name\"=\"Caf\xE9\"\r\n";
-    const std::string utf8 =
-        "Windows Registry Editor Version 5.00\n[HKCU\\Software\\Vantric]\n\"Name\"=\"Caf\xC3\xA9\"\n";
+    const std::string utf8 = "Windows Registry Editor Version 5.00\n"
+                             "[HKCU\\Software\\Vantric]\n\"Name\"=\"Caf\xC3\xA9\"\n";
     for (const std::string& file :
          {"\xFF\xFE" + reg::ToUtf16(text), reg::ToUtf16(text), "\xEF\xBB\xBF" + utf8, utf8, text}) {
         reg::RegFileError error;

@@ -142,7 +142,8 @@ TEST_F(RegistryTest, QueryValueGivesSizesAndTheBytesAsWritten) {
 TEST_F(RegistryTest, AccessRightsAndKeyDeletionFollowWindows) {
     Create("Software\\Vantric\\Pex\\Zendor32");
     reg::Key readOnly;
-    ASSERT_EQ(0, reg::OpenKey(reg::kLocalMachine, "Software\\Vantric", reg::kKeyRead, readOnly.out()));
+    ASSERT_EQ(0, reg::OpenKey(reg::kLocalMachine, "Software\\Vantric", reg::kKeyRead,
+                              readOnly.out()));
     EXPECT_EQ(5, SetText(readOnly.get(), "x", "y"));
     EXPECT_EQ(5u, plat::LastError());
     EXPECT_EQ(5, reg::DeleteValue(readOnly.get(), "x"));
@@ -159,7 +160,8 @@ TEST_F(RegistryTest, AccessRightsAndKeyDeletionFollowWindows) {
 
 TEST_F(RegistryTest, ClassesRootIsAViewOfTheMachineClasses) {
     reg::Key viaView;
-    ASSERT_EQ(0, reg::CreateKey(reg::kClassesRoot, ".pex", reg::kKeyAllAccess, viaView.out(), nullptr));
+    ASSERT_EQ(0, reg::CreateKey(reg::kClassesRoot, ".pex", reg::kKeyAllAccess, viaView.out(),
+                                nullptr));
     ASSERT_EQ(0, SetText(viaView.get(), "", "Pex.File"));
     reg::Key direct;
     ASSERT_EQ(0, reg::OpenKey(reg::kLocalMachine, "Software\\Classes\\.PEX", reg::kKeyRead,
@@ -241,7 +243,8 @@ TEST_F(RegistryTest, ABatchTakesEffectWholeOrNotAtAll) {
         ASSERT_EQ(0, batch.Status());
         ASSERT_EQ(0, SetText(key.get(), "dropped", "x"));
         reg::Key child;
-        ASSERT_EQ(0, reg::CreateKey(key.get(), "DroppedKey", reg::kKeyAllAccess, child.out(), nullptr));
+        ASSERT_EQ(0, reg::CreateKey(key.get(), "DroppedKey", reg::kKeyAllAccess, child.out(),
+                                    nullptr));
     }
     EXPECT_EQ("<missing>", Text(key.get(), "dropped"));
     EXPECT_TRUE(SubKeys(key.get()).empty());
@@ -258,7 +261,8 @@ TEST_F(RegistryTest, HandlesBelongToTheirMachine) {
     {
         pextest::TestMachine other;
         reg::Key there;
-        EXPECT_EQ(2, reg::OpenKey(reg::kLocalMachine, "Software\\Vantric", reg::kKeyRead, there.out()));
+        EXPECT_EQ(2, reg::OpenKey(reg::kLocalMachine, "Software\\Vantric", reg::kKeyRead,
+                                  there.out()));
         EXPECT_EQ(6, SetText(key.get(), "stale", "x"));
     }
 }
