@@ -42,16 +42,12 @@ TEST(CommandString, EveryTagReachesItsExecutorWithTheTrimmedParameter) {
     RecordingCommands commands;
     EXPECT_TRUE(commands.Execute(
         "[RUN] a b ;[DEL]\tb;[DELIFEXISTS]c;[REGSVR] d;[REGISTRY] e;"
-        "[try-run]f;[Try-Del]g;[TRY-DELIFEXISTS]h;[TRY-REGSVR]i;[TRY-REGISTRY]j;[RUN]"));
+        "[try-run]f;[Try-Del]g;[TRY-DELIFEXISTS]h;[TRY-REGSVR]i;[TRY-REGISTRY]j;[RUN];"
+        // Tags count only at the start of an item and over their own full length.
+        "x[DEL] k;[DELIF] l;[DEL]IFEXISTS] m;[TRY-]n;[RU"));
     EXPECT_EQ(commands.calls,
-              (Lines{"Run(a b)", "Del(b)", "DelIfExists(c)", "RegSvr(d)", "Registry(e)", "Run(f)",
-                     "Del(g)", "DelIfExists(h)", "RegSvr(i)", "Registry(j)", "Run()"}));
-}
-
-TEST(CommandString, TagsMatchOnlyAtTheStartAndOverTheirFullLength) {
-    RecordingCommands commands;
-    EXPECT_TRUE(commands.Execute("x[DEL] a;[DELIF] b;[DEL]IFEXISTS] c;[DELIFEXISTS]d;[TRY-]e;[RU"));
-    EXPECT_EQ(commands.calls, (Lines{"Del(IFEXISTS] c)", "DelIfExists(d)"}));
+              (Lines{"Run(a b)", "Del(b)", "DelIfExists(c)", "RegSvr(d)", "Registry(e)", "Run(f)", "Del(g)",
+                     "DelIfExists(h)", "RegSvr(i)", "Registry(j)", "Run()", "Del(IFEXISTS] m)"}));
 }
 
 TEST(CommandString, TracesEveryItemAndSkipsUnknownOnesSilently) {
