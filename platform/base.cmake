@@ -20,5 +20,5 @@ if(NOT WIN32)
   # dladdr for module file names.
   target_link_libraries(pex_platform_base PUBLIC ${CMAKE_DL_LIBS})
 endif()
-target_link_libraries(pex_platform INTERFACE pex_platform_base)
+list(APPEND PEX_PLATFORM_PARTS pex_platform_base)
 pex_warnings(pex_platform_base)

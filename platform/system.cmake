@@ -32,7 +32,7 @@ target_link_libraries(pex_system PUBLIC
   $<TARGET_NAME_IF_EXISTS:pex_registry>
   $<TARGET_NAME_IF_EXISTS:pex_framework>
   ${CMAKE_DL_LIBS})
-target_link_libraries(pex_platform INTERFACE pex_system)
+list(APPEND PEX_PLATFORM_PARTS pex_system)
 pex_warnings(pex_system)
 
 # pex_stamp_version(): the modules and programs built after the platform stamp their version.

@@ -3,6 +3,6 @@
 foreach(unit cfile sync ole_date bstr app)
   set(source ${CMAKE_CURRENT_SOURCE_DIR}/platform/${unit}_test.cpp)
   if(EXISTS ${source})
-    pex_add_test(platform_${unit}_test SOURCES ${source} LIBS pex_framework)
+    pex_add_test(platform_${unit}_test SOURCES ${source} LIBS pex_platform)
   endif()
 endforeach()

@@ -2,5 +2,5 @@
 foreach(unit paths files fault)
   pex_add_test(platform_${unit}_test
     SOURCES ${CMAKE_CURRENT_SOURCE_DIR}/platform/${unit}_test.cpp
-    LIBS pex_platform_base)
+    LIBS pex_platform)
 endforeach()
