@@ -1,9 +1,28 @@
 #include "rivzip/match_finder.h"
 
+#include <cstring>
+
 namespace rivzip {
 
 MatchFinder::MatchFinder(std::uint32_t maxChain)
     : maxChain_(maxChain), head_(std::size_t{1} << kHashBits, -1), link_(szdd::kWindowSize, -1) {}
+
+namespace {
+
+// How many leading bytes of a and b agree, at most limit; eight at a time while it can.
+std::uint32_t CommonLength(const std::uint8_t* a, const std::uint8_t* b, std::uint32_t limit) {
+    std::uint32_t length = 0;
+    for (; length + 8 <= limit; length += 8) {
+        std::uint64_t x, y;
+        std::memcpy(&x, a + length, 8);
+        std::memcpy(&y, b + length, 8);
+        if (x != y) break;
+    }
+    while (length < limit && a[length] == b[length]) ++length;
+    return length;
+}
+
+}  // namespace
 
 std::uint32_t MatchFinder::Hash(const std::uint8_t* data) {
     std::uint32_t key = data[0] | data[1] << 8 | data[2] << 16;
@@ -29,8 +48,7 @@ MatchFinder::Match MatchFinder::FindAndInsert(const std::uint8_t* data, std::uin
          ++steps) {
         const std::uint8_t* from = data - (here - candidate);
         if (from[best.length] == data[best.length]) {  // cheap reject of shorter matches
-            std::uint32_t length = 0;
-            while (length < maxLength && from[length] == data[length]) ++length;
+            std::uint32_t length = CommonLength(from, data, maxLength);
             if (length > best.length && length >= szdd::kMinMatch) {
                 best.length = length;
                 best.source = static_cast<std::uint64_t>(candidate);

@@ -23,7 +23,7 @@ public:
         std::uint64_t source = 0;  // absolute position copied from
     };
 
-    explicit MatchFinder(std::uint32_t maxChain = 64);
+    explicit MatchFinder(std::uint32_t maxChain = 32);
 
     // Finds the longest match (at most maxLength bytes, which are all at hand) for the data at
     // `data`, whose absolute position is `position`, then inserts the position. Needs at least
