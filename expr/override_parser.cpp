@@ -41,6 +41,7 @@ int ParseOverrideText(const std::string& text) {
         ScannerSession session(text);
         return pexexprparse();
     } catch (const ScannerFailure&) {
+        ScannerReset();  // also when the failure came while the input was being installed
         return kParseScannerFailure;
     }
 }

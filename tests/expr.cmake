@@ -4,7 +4,7 @@ target_link_libraries(pex_expr_test_support PUBLIC pex_commands pex_expr pex_tes
                       GTest::gtest)
 pex_warnings(pex_expr_test_support)
 
-foreach(unit override_expression override_parser validation builtins execution_plan version_text)
+foreach(unit override_expression override_parser validation builtins execution_plan)
   if(EXISTS ${CMAKE_CURRENT_SOURCE_DIR}/expr/${unit}_test.cpp)
     pex_add_test(expr_${unit}_test
       SOURCES ${CMAKE_CURRENT_SOURCE_DIR}/expr/${unit}_test.cpp
@@ -16,4 +16,10 @@ if(EXISTS ${CMAKE_CURRENT_SOURCE_DIR}/commands/update_services_test.cpp)
   pex_add_test(update_services_test
     SOURCES ${CMAKE_CURRENT_SOURCE_DIR}/commands/update_services_test.cpp
     LIBS pex_expr_test_support)
+endif()
+
+if(TARGET expr_builtins_test)
+  # FileVersionAtLeast reads a real Windows DLL with a version resource.
+  target_compile_definitions(expr_builtins_test PRIVATE
+    PEX_FIXTURE_DIR="${CMAKE_CURRENT_SOURCE_DIR}/fixtures")
 endif()

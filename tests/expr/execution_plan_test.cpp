@@ -1,0 +1,111 @@
+#include "expr/execution_plan.h"
+
+#include <gtest/gtest.h>
+
+#include "expr/expression_tree.h"
+#include "tests/expr/expr_test_support.h"
+
+namespace {
+
+using exprtest::TestRow;
+using exprtest::TraceRecorder;
+using Lines = std::vector<std::string>;
+
+bool QuietParse(ExecutionPlan& plan, const std::string& text) {
+    testing::internal::CaptureStdout();
+    bool ok = plan.Parse(text);
+    testing::internal::GetCapturedStdout();
+    return ok;
+}
+
+TEST(ExecutionPlan, OneAssignmentFromParseToRow) {
+    TraceRecorder trace;
+    TestRow row;
+    ExecutionPlan plan;
+    ASSERT_TRUE(QuietParse(plan, "FORCED = TRUE"));
+    EXPECT_TRUE(plan.Validate());
+    EXPECT_EQ(plan.Execute(row.services), 0);
+    EXPECT_TRUE(plan.Comments().empty());
+    EXPECT_EQ(row.Cell("Force Download"), "1");
+    EXPECT_EQ(trace.Lines(),
+              (Lines{"Parsing: FORCED = TRUE", "Creating Variable [FORCED] of type Func",
+                     "Assigning Setting:FORCED()=true", "pushing # 1, SET()",
+                     "Validating ExecutionPlan: Here we go....!", "Validating Execution Item # 0.",
+                     "-- Done.", "The plan is: valid.", "That's all folks!",
+                     "ExecutingPlan: Here we go....!", "Executing Item # 0.",
+                     "Setting Symbol: FORCED(Force Download) to 1", "-- Done.",
+                     "That's all folks!"}));
+}
+
+TEST(ExecutionPlan, TreeBuildingTraces) {
+    TraceRecorder trace;
+    ExecutionPlan plan;
+    ASSERT_TRUE(QuietParse(plan, "SNOOZEABLE = AND(TRUE, \"x\"); FORCED = FileName"));
+    EXPECT_EQ(trace.Lines(),
+              (Lines{"Parsing: SNOOZEABLE = AND(TRUE, \"x\"); FORCED = FileName",
+                     "Evaluate Function [AND()]. Params are 2:true,x", "[true]", "[x]",
+                     "Function Result: (Result:AND())",
+                     "Error creating Variable [SNOOZEABLE]: Unknown Name!",
+                     "Assigning Setting:HResult: 0x8000ffff(Failed!):=AND()", "pushing # 1, SET()",
+                     "Creating Variable [FileName] of type Func",
+                     "Creating Variable [FORCED] of type Func",
+                     "Assigning Setting:FORCED()=FileName()", "pushing # 2, SET()"}));
+}
+
+TEST(ExecutionPlan, EveryItemRunsAndFailuresAreRecorded) {
+    TestRow row;
+    ExecutionPlan twice;
+    ASSERT_TRUE(QuietParse(twice, "FORCED = TRUE; FORCED = FALSE"));
+    EXPECT_EQ(twice.Execute(row.services), 0);
+    EXPECT_EQ(row.services.writes, (Lines{"FORCED=1", "FORCED=0"}));
+
+    TraceRecorder trace;
+    TestRow noAvar("Force Download,HomeDir", "0,C:\\App");
+    ExecutionPlan plan;
+    ASSERT_TRUE(QuietParse(plan, "FORCED = AND(AVAR, TRUE); FORCED = NOT FORCED"));
+    ASSERT_TRUE(plan.Validate());
+    EXPECT_EQ(plan.Execute(noAvar.services), COverrideExpression::kUnexpected);
+    EXPECT_EQ(plan.Comments(), Lines{"HResult: 0x8000ffff(Failed!):GetVar: Type Mismatch"});
+    EXPECT_EQ(noAvar.Cell("Force Download"), "1");
+    Lines lines = trace.Lines();
+    EXPECT_EQ(Lines(lines.end() - 10, lines.end()),
+              (Lines{"Executing Item # 0.", "         Looking up Variable [AVAR] of type Bool",
+                     "Plan Execution threw exception", "-- Done.", "Executing Item # 1.",
+                     "         Looking up Variable [FORCED] of type Bool",
+                     "Getting Symbol: FORCED --> FieldName:[Force Download]=[0]",
+                     "Setting Symbol: FORCED(Force Download) to 1", "-- Done.",
+                     "That's all folks!"}));
+}
+
+TEST(ExecutionPlan, ValidationStopsCheckingAfterTheFirstInvalidItem) {
+    TraceRecorder trace;
+    ExecutionPlan plan;
+    ASSERT_TRUE(QuietParse(plan, "FORCED = \"x\"; FORCED = 1"));
+    trace.Clear();
+    EXPECT_FALSE(plan.Validate());
+    EXPECT_EQ(plan.Comments(), Lines{"Type mismatch between FORCED and "});
+    EXPECT_EQ(trace.Lines(),
+              (Lines{"Validating ExecutionPlan: Here we go....!", "Validating Execution Item # 0.",
+                     "-- Done.", "Validating Execution Item # 1.", "-- Done.",
+                     "The plan is: INVALID.  Validation Comments:", "That's all folks!"}));
+    EXPECT_FALSE(plan.Validate());
+    EXPECT_EQ(plan.Comments().size(), 1u);  // comments start afresh
+}
+
+TEST(ExecutionPlan, TheCurrentPlanReceivesThePushes) {
+    {
+        ExecutionPlan plan;
+        EXPECT_FALSE(QuietParse(plan, ""));
+        EXPECT_TRUE(QuietParse(plan, "FORCED = TRUE"));
+        EXPECT_TRUE(QuietParse(plan, "FORCED = FALSE"));  // a second parse appends
+        EXPECT_EQ(plan.Items().size(), 2u);
+        EXPECT_EQ(&CurrentPlan(), &plan);
+    }
+    EXPECT_EQ(&CurrentPlan(), &DefaultPlan());
+    std::size_t before = DefaultPlan().Items().size();
+    COverrideExpression value = COverrideExpression::FromBool(true);
+    MakeAssignment(COverrideExpression::FromString("FORCED"), value);
+    EXPECT_EQ(DefaultPlan().Items().size(), before + 1);
+}
+
+}  // namespace
