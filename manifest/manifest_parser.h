@@ -25,6 +25,7 @@ public:
     // Empties the special-file list and clears the special-file-attempted flag.
     void ClearSpecialFileList();
     bool WasSpecialFileUpdateAttempted() const { return specialFileAttempted_; }
+    const std::set<std::string>& SpecialFiles() const { return specialFiles_; }
 
     // --- product settings ---
     bool Init(std::string project);

@@ -1,0 +1,125 @@
+// The product loop, the special-file list, the schedule reset and the progress record.
+#include <gtest/gtest.h>
+
+#include <string>
+#include <vector>
+
+#include "entry/update_all.h"
+#include "manifest/manifest_parser.h"
+#include "tests/support/test_machine.h"
+#include "tests/support/test_registry.h"
+#include "tests/support/trace_capture.h"
+
+namespace reg = plat::reg;
+
+namespace {
+
+const char* const kProducts = "Software\\Vantric\\Pex";
+
+struct Seen {
+    std::int32_t total;
+    std::int32_t current;
+    std::string status;
+};
+std::vector<Seen> g_seen;
+
+bool Record(CProgressData* p) {
+    g_seen.push_back({p->TotalSteps, p->CurrentStep, p->StatusText});
+    return false;  // ignored by the library
+}
+
+std::vector<std::string> Matching(const std::vector<std::string>& lines, const std::string& prefix) {
+    std::vector<std::string> out;
+    for (const auto& l : lines)
+        if (l.compare(0, prefix.size(), prefix) == 0) out.push_back(l);
+    return out;
+}
+
+class UpdateAllTest : public ::testing::Test {
+protected:
+    void SetUp() override { g_seen.clear(); }
+    pextest::TestMachine machine;
+    pextest::TraceCapture trace;
+};
+
+TEST_F(UpdateAllTest, WithoutProductsKeyNothingIsTraced) {
+    EXPECT_FALSE(UpdateAll(&Record));
+    EXPECT_TRUE(trace.Lines().empty());
+    EXPECT_TRUE(g_seen.empty());
+    EXPECT_FALSE(g_TraceLog.IsOpen());
+}
+
+TEST_F(UpdateAllTest, EmptyProductsKeyReportsZeroStepsAndNoMoreItems) {
+    pextest::CreateRegKey(reg::kLocalMachine, kProducts);
+    EXPECT_FALSE(UpdateAll(&Record));
+    ASSERT_EQ(g_seen.size(), 1u);
+    EXPECT_EQ(g_seen[0].total, 0);
+    EXPECT_EQ(trace.Lines(), (std::vector<std::string>{"UpdateAll, main key is open",
+                                                       "UpdateAll, RegEnumKey returned 259"}));
+}
+
+TEST_F(UpdateAllTest, ProductsRunInOrderWithOneStepEach) {
+    for (const char* name : {"Orlandel", "Zendor32", "Fetchwell"})
+        pextest::CreateRegKey(reg::kLocalMachine, std::string(kProducts) + "\\" + name);
+    const std::int32_t before = g_ProgressData.CurrentStep;
+    UpdateAll(&Record);
+    EXPECT_EQ(Matching(trace.Lines(), "UpdateAll, key"),
+              (std::vector<std::string>{"UpdateAll, key 1 is 'Fetchwell'", "UpdateAll, key 2 is 'Orlandel'",
+                                        "UpdateAll, key 3 is 'Zendor32'"}));
+    // Each product step is reported before the product's own "Analyzing data..." report.
+    std::vector<std::int32_t> productSteps;
+    for (const Seen& s : g_seen)
+        if (s.status == "Analyzing data...") productSteps.push_back(s.current - before);
+    EXPECT_EQ(productSteps, (std::vector<std::int32_t>{1, 2, 3}));
+    EXPECT_EQ(g_seen.front().total, 3);
+}
+
+TEST_F(UpdateAllTest, NullCallbackProcessesProductsAlike) {
+    pextest::CreateRegKey(reg::kLocalMachine, std::string(kProducts) + "\\Pellow");
+    UpdateAll(nullptr);
+    EXPECT_TRUE(trace.Contains("UpdateAll, key 1 is 'Pellow'"));
+    EXPECT_TRUE(trace.Contains("CManifestParser: ProcessUpdateInformation, No content file exists, nothing to do"));
+}
+
+TEST_F(UpdateAllTest, SpecialFileNamesAreTrimmedAndUpperCased) {
+    CManifestParser parser;
+    parser.AddToSpecialList(" pellow.exe\n");
+    parser.AddToSpecialList("PELLOW.EXE");
+    EXPECT_EQ(parser.SpecialFiles(), (std::set<std::string>{"PELLOW.EXE"}));
+    parser.ClearSpecialFileList();
+    EXPECT_TRUE(parser.SpecialFiles().empty());
+    EXPECT_FALSE(parser.WasSpecialFileUpdateAttempted());
+}
+
+TEST_F(UpdateAllTest, ScheduleResetWritesOnlyExistingKeys) {
+    ResetUpdateScheduleDates();
+    EXPECT_EQ(Matching(trace.Lines(), "Mendler: RegOpenKeyEx failed with 2").size(), 6u);
+    EXPECT_EQ(trace.Lines()[0], "Mendler: Setting Registry Key "
+                                "Software\\Vantric\\OEM\\Tessary\\Zendor32\\MatrixUpdates.LastDate to ''");
+    EXPECT_FALSE(pextest::RegKeyExists(reg::kLocalMachine, "Software\\Vantric\\Zendor32"));
+
+    trace.Clear();
+    const std::string key = "Software\\Vantric\\Zendor32\\MatrixUpdates";
+    pextest::SetRegText(reg::kLocalMachine, key, "NextDate", "12/31/2026");
+    ResetUpdateScheduleDates();
+    std::string bytes;
+    std::uint32_t type = 0;
+    ASSERT_TRUE(pextest::GetRegValue(reg::kLocalMachine, key, "NextDate", &bytes, &type));
+    EXPECT_EQ(type, reg::kRegSz);
+    EXPECT_EQ(bytes, "");  // written without a terminating zero
+    EXPECT_TRUE(pextest::GetRegValue(reg::kLocalMachine, key, "LastDate", &bytes));
+    EXPECT_EQ(Matching(trace.Lines(), "Mendler: set value successfully...").size(), 2u);
+}
+
+TEST(ProgressDataTest, StatusTextIsCutTo255Characters) {
+    CProgressData progress;
+    EXPECT_FALSE(progress.StatusTextSet);
+    progress.SetStatusText(std::string(300, 'x'));
+    EXPECT_EQ(std::string(progress.StatusText), std::string(255, 'x'));
+    EXPECT_TRUE(progress.StatusTextSet);
+    progress.IncrementCurrentStep();
+    progress.IncrementCurrentStep();
+    EXPECT_EQ(progress.CurrentStep, 2);
+}
+
+}  // namespace
