@@ -19,3 +19,11 @@ if(TARGET rivzip_codec)
     target_link_libraries(rivzip_interop_test PRIVATE ${PEX_MSPACK_LIBRARY})
   endif()
 endif()
+
+if(TARGET Rivzip)
+  # Loads Rivzip.dll by its bare name, which the loader finds beside the test program.
+  pex_add_test(rivzip_module_test
+    SOURCES rivzip/memory_streams.cpp rivzip/rivzip_module_test.cpp
+    LIBS rivzip_codec)
+  add_dependencies(rivzip_module_test Rivzip)
+endif()
