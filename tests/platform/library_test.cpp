@@ -6,7 +6,6 @@
 #include <gtest/gtest.h>
 
 #include <cstdint>
-#include <cstdlib>
 #include <filesystem>
 #include <string>
 
@@ -76,16 +75,12 @@ TEST(Library, ExportsAndTheUndecoratedFallback) {
 
 TEST(Library, SelfRegisteringModuleRuns) {
     pextest::TestMachine m;
-    // The module carries its own copy of the platform, which finds the machine as a child
-    // process would: through PEX_MACHINE.
-    setenv("PEX_MACHINE", m.Root().c_str(), 1);
     Library lib(plat::lib::Load("PexSelfReg.dll"));
     ASSERT_TRUE(lib);
     auto reg = reinterpret_cast<std::int32_t (*)()>(plat::lib::FindExport(lib.get(), "DllRegisterServer"));
     ASSERT_NE(reg, nullptr);
     EXPECT_EQ(reg(), 0);
     lib.Reset();
-    unsetenv("PEX_MACHINE");
 
     plat::reg::Key key;
     ASSERT_EQ(plat::reg::OpenKey(plat::reg::kLocalMachine, "Software\\Vantric\\Test", plat::reg::kKeyRead,
