@@ -1,0 +1,60 @@
+// `pexupdate compress` and `pexupdate expand` as people run them: Windows paths of the machine
+// or host paths, exit codes, and no half-expanded output left behind.
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+#include <string>
+#include <sys/wait.h>
+
+#include "platform/files.h"
+#include "tests/rivzip/memory_streams.h"
+#include "tests/support/test_machine.h"
+
+namespace rivziptest {
+namespace {
+
+class CompressCommand : public ::testing::Test {
+protected:
+    // Runs pexupdate on this test's machine; args go to the shell as they stand.
+    int Pexupdate(const std::string& args) {
+        std::string command = "'" PEXUPDATE_PATH "' --machine '" + machine_.Root() + "' " + args +
+                              " >/dev/null 2>&1";
+        int status = std::system(command.c_str());
+        return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+    }
+
+    pextest::TestMachine machine_;
+};
+
+TEST_F(CompressCommand, CompressThenExpandGivesTheFileBack) {
+    Bytes bytes = TextLike(90000, 41);
+    std::string original(bytes.begin(), bytes.end());
+    machine_.WriteFile("C:\\pub\\setup.exe", original);
+    ASSERT_EQ(Pexupdate("compress 'C:\\pub\\setup.exe' 'C:\\pub\\setup.ex_'"), 0);
+    std::string szdd = machine_.ReadFile("C:\\pub\\setup.ex_");
+    EXPECT_EQ(szdd.compare(0, 4, "SZDD"), 0);
+    EXPECT_LT(szdd.size(), original.size());
+    ASSERT_EQ(Pexupdate("expand 'C:\\pub\\setup.ex_' 'C:\\pub\\again.exe'"), 0);
+    EXPECT_EQ(machine_.ReadFile("C:\\pub\\again.exe"), original);
+}
+
+TEST_F(CompressCommand, TakesHostPaths) {
+    machine_.WriteFile("C:\\a.txt", "host paths name files of the machine too");
+    std::string drive = machine_.DriveC();
+    ASSERT_EQ(Pexupdate("compress '" + drive + "/a.txt' '" + drive + "/a.tx_'"), 0);
+    ASSERT_EQ(Pexupdate("expand '" + drive + "/a.tx_' 'C:\\b.txt'"), 0);
+    EXPECT_EQ(machine_.ReadFile("C:\\b.txt"), "host paths name files of the machine too");
+}
+
+TEST_F(CompressCommand, FailuresAndUsage) {
+    machine_.WriteFile("C:\\dl\\plain.txt", "not compressed");
+    EXPECT_EQ(Pexupdate("expand 'C:\\dl\\plain.txt' 'C:\\dl\\out.txt'"), 1);
+    EXPECT_FALSE(plat::files::Exists("C:\\dl\\out.txt")) << "a failed expansion leaves no output";
+    EXPECT_EQ(Pexupdate("expand 'C:\\dl\\missing.ex_' 'C:\\dl\\out.txt'"), 1);
+    EXPECT_EQ(Pexupdate("expand 'C:\\dl\\plain.txt'"), 2);
+    EXPECT_EQ(Pexupdate("compress --help"), 0);
+    EXPECT_EQ(Pexupdate("expand --help"), 0);
+}
+
+}  // namespace
+}  // namespace rivziptest
