@@ -26,6 +26,10 @@ HModule Load(const std::string& nameOrPath);
 // entry points under plain names. nullptr and 127 when there is no such export.
 Proc FindExport(HModule module, const std::string& name);
 
+// The Windows path of the file that Load would load for nameOrPath (the same search); empty and
+// 126 when there is none.
+std::string SearchFile(const std::string& nameOrPath);
+
 // FreeLibrary: drops one reference; the module is unloaded with the last. False (6) for a null
 // handle.
 bool Free(HModule module);

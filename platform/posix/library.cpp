@@ -56,6 +56,15 @@ std::uint32_t LoadError() {
 
 }  // namespace
 
+std::string SearchFile(const std::string& nameOrPath) {
+    const std::string host = nameOrPath.empty() ? std::string() : FindModule(nameOrPath);
+    if (host.empty()) {
+        SetLastErrorCode(kErrorModNotFound);
+        return std::string();
+    }
+    return paths::ToWindows(host);
+}
+
 HModule Load(const std::string& nameOrPath) {
     std::string host = nameOrPath.empty() ? std::string() : FindModule(nameOrPath);
     if (host.empty()) {
