@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <random>
+#include <string>
 
 #include "rivzip/progress_reporter.h"
 #include "rivzip/szdd_compressor.h"
@@ -13,7 +14,7 @@
 namespace rivziptest {
 
 std::int64_t MemorySource::Read(std::uint8_t* buffer, std::uint32_t count) {
-    if (offset_ >= failAfter_) return -1;
+    if (offset_ >= failAfter) return -1;
     std::uint64_t n = std::min<std::uint64_t>({count, maxChunk_, data_.size() - offset_});
     std::copy_n(data_.begin() + offset_, n, buffer);
     offset_ += n;
@@ -21,44 +22,35 @@ std::int64_t MemorySource::Read(std::uint8_t* buffer, std::uint32_t count) {
 }
 
 bool MemorySink::Write(const std::uint8_t* bytes, std::uint32_t count) {
-    if (data.size() + count > failAfter_) return false;
+    if (data.size() + count > failAfter) return false;
     data.insert(data.end(), bytes, bytes + count);
-    ++writes;
     return true;
 }
 
-static ProgressLog* g_log = nullptr;
-
-ProgressLog::ProgressLog() { g_log = this; }
-ProgressLog::~ProgressLog() { g_log = nullptr; }
-void ProgressLog::Record(SCompressPerformance& report) {
-    if (g_log) g_log->reports.push_back(report);
+std::vector<SCompressPerformance>& Reports() {
+    static std::vector<SCompressPerformance> reports;
+    return reports;
 }
 
-void ExpectWellFormedReports(const std::vector<SCompressPerformance>& reports, std::uint32_t total,
-                             std::uint32_t finalProcessed, std::int32_t result) {
+void Record(SCompressPerformance& report) { Reports().push_back(report); }
+
+void ExpectWellFormedReports(std::uint32_t total, std::uint32_t finalProcessed, std::int32_t result) {
+    const auto& reports = Reports();
     ASSERT_GE(reports.size(), 2u);
-    const SCompressPerformance& first = reports.front();
-    const SCompressPerformance& last = reports.back();
-    EXPECT_TRUE(first.starting != 0 && first.ending == 0 && first.processed == 0);
-    EXPECT_EQ(first.total, total);
-    EXPECT_TRUE(last.ending != 0 && last.starting == 0);
-    EXPECT_EQ(last.processed, finalProcessed);
-    EXPECT_EQ(last.result, result);
-    std::uint32_t block = rivzip::ProgressReporter::kProgressBlock;
+    EXPECT_TRUE(reports.front().starting && !reports.front().ending && reports.front().processed == 0);
+    EXPECT_TRUE(reports.back().ending && !reports.back().starting);
+    EXPECT_EQ(reports.back().processed, finalProcessed);
+    EXPECT_EQ(reports.back().result, result);
+    const std::uint32_t block = rivzip::ProgressReporter::kProgressBlock;
+    EXPECT_EQ(reports.size() - 2, finalProcessed / block) << "one report per block done";
     for (std::size_t i = 1; i < reports.size(); ++i) {
-        const SCompressPerformance& r = reports[i];
-        EXPECT_EQ(r.total, total);
-        EXPECT_LE(r.processed, total);
-        EXPECT_GE(r.processed, reports[i - 1].processed) << "report " << i;
+        EXPECT_EQ(reports[i].total, total);
+        EXPECT_LE(reports[i].processed, total);
+        EXPECT_GE(reports[i].processed, reports[i - 1].processed);
         if (i + 1 < reports.size()) {
-            EXPECT_TRUE(r.starting == 0 && r.ending == 0);
-            EXPECT_GE(r.processed, i * block) << "a middle report before its block is done";
-            EXPECT_LT(r.processed, (i + 1) * block) << "a block without its report";
+            EXPECT_EQ(reports[i].processed / block, i) << "report " << i;
         }
     }
-    std::size_t middle = reports.size() - 2;
-    EXPECT_EQ(middle, finalProcessed / block) << "one report per block done";
 }
 
 Bytes Compress(const Bytes& original, std::uint32_t maxChunk) {
@@ -93,27 +85,15 @@ Bytes RandomBytes(std::size_t size, std::uint32_t seed) {
 }
 
 Bytes TextLike(std::size_t size, std::uint32_t seed) {
-    static const char* const kWords[] = {"update ", "file ", "the ", "version ", "install ", "Vantric ",
+    static const std::string kWords[] = {"update ", "file ", "the ", "version ", "install ", "Vantric ",
                                          "registry ", "product\r\n", "a ", "content "};
     std::mt19937 rng(seed);
     Bytes out;
     while (out.size() < size) {
-        const char* word = kWords[rng() % 10];
-        out.insert(out.end(), word, word + std::char_traits<char>::length(word));
+        const std::string& word = kWords[rng() % 10];
+        out.insert(out.end(), word.begin(), word.end());
     }
     out.resize(size);
-    return out;
-}
-
-Bytes Runs(std::size_t size) {
-    Bytes out(size);
-    for (std::size_t i = 0; i < size; ++i) out[i] = static_cast<std::uint8_t>((i / 1000) % 3 == 0 ? 0 : i / 1000);
-    return out;
-}
-
-Bytes AllByteValues(std::size_t size) {
-    Bytes out(size);
-    for (std::size_t i = 0; i < size; ++i) out[i] = static_cast<std::uint8_t>(i);
     return out;
 }
 
