@@ -14,15 +14,17 @@
 namespace rivziptest {
 
 std::int64_t MemorySource::Read(std::uint8_t* buffer, std::uint32_t count) {
-    if (offset_ >= failAfter) return -1;
-    std::uint64_t n = std::min<std::uint64_t>({count, maxChunk_, data_.size() - offset_});
-    std::copy_n(data_.begin() + offset_, n, buffer);
-    offset_ += n;
+    if (delivered >= failAfter) return -1;
+    std::uint64_t n = std::min<std::uint64_t>({count, maxChunk_, data_.size() - delivered});
+    std::copy_n(data_.begin() + delivered, n, buffer);
+    delivered += n;
     return static_cast<std::int64_t>(n);
 }
 
 bool MemorySink::Write(const std::uint8_t* bytes, std::uint32_t count) {
     if (data.size() + count > failAfter) return false;
+    if (data.empty() && watched) deliveredAtFirstWrite = watched->delivered;
+    largestWrite = std::max(largestWrite, count);
     data.insert(data.end(), bytes, bytes + count);
     return true;
 }

@@ -16,11 +16,11 @@ public:
     explicit MemorySource(const Bytes& data, std::uint32_t maxChunk = UINT32_MAX) : data_(data), maxChunk_(maxChunk) {}
     std::int64_t Read(std::uint8_t* buffer, std::uint32_t count) override;
     std::uint64_t failAfter = UINT64_MAX;  // every read fails once this many bytes were delivered
+    std::uint64_t delivered = 0;
 
 private:
     const Bytes& data_;
     std::uint32_t maxChunk_;
-    std::uint64_t offset_ = 0;
 };
 
 class MemorySink : public rivzip::ByteSink {
@@ -28,6 +28,9 @@ public:
     bool Write(const std::uint8_t* bytes, std::uint32_t count) override;
     Bytes data;
     std::uint64_t failAfter = UINT64_MAX;  // refuses a write that would pass this many bytes
+    std::uint32_t largestWrite = 0;
+    const MemorySource* watched = nullptr;  // its delivered count is noted at the first write
+    std::uint64_t deliveredAtFirstWrite = 0;
 };
 
 // The progress function for tests: appends every report to Reports().
