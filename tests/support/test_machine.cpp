@@ -43,3 +43,14 @@ std::string TestMachine::ReadFile(const std::string& winPath) const {
 }
 
 }  // namespace pextest
+
+namespace pextest {
+
+std::string ReadHostFile(const std::string& hostPath) {
+    std::ifstream in(hostPath, std::ios::binary);
+    std::ostringstream s;
+    s << in.rdbuf();
+    return s.str();
+}
+
+}  // namespace pextest

@@ -25,3 +25,8 @@ private:
 };
 
 }  // namespace pextest
+
+namespace pextest {
+// The bytes of a host file (fixtures); empty when missing.
+std::string ReadHostFile(const std::string& hostPath);
+}  // namespace pextest
