@@ -26,24 +26,14 @@ protected:
     pextest::TestMachine machine_;
 };
 
-TEST_F(CompressCommand, CompressThenExpandGivesTheFileBack) {
+TEST_F(CompressCommand, CompressThenExpandByWindowsOrHostPaths) {
     Bytes bytes = TextLike(90000, 41);
     std::string original(bytes.begin(), bytes.end());
     machine_.WriteFile("C:\\pub\\setup.exe", original);
-    ASSERT_EQ(Pexupdate("compress 'C:\\pub\\setup.exe' 'C:\\pub\\setup.ex_'"), 0);
-    std::string szdd = machine_.ReadFile("C:\\pub\\setup.ex_");
-    EXPECT_EQ(szdd.compare(0, 4, "SZDD"), 0);
-    EXPECT_LT(szdd.size(), original.size());
+    ASSERT_EQ(Pexupdate("compress 'C:\\pub\\setup.exe' '" + machine_.DriveC() + "/pub/setup.ex_'"), 0);
+    EXPECT_LT(machine_.ReadFile("C:\\pub\\setup.ex_").size(), original.size());
     ASSERT_EQ(Pexupdate("expand 'C:\\pub\\setup.ex_' 'C:\\pub\\again.exe'"), 0);
     EXPECT_EQ(machine_.ReadFile("C:\\pub\\again.exe"), original);
-}
-
-TEST_F(CompressCommand, TakesHostPaths) {
-    machine_.WriteFile("C:\\a.txt", "host paths name files of the machine too");
-    std::string drive = machine_.DriveC();
-    ASSERT_EQ(Pexupdate("compress '" + drive + "/a.txt' '" + drive + "/a.tx_'"), 0);
-    ASSERT_EQ(Pexupdate("expand '" + drive + "/a.tx_' 'C:\\b.txt'"), 0);
-    EXPECT_EQ(machine_.ReadFile("C:\\b.txt"), "host paths name files of the machine too");
 }
 
 TEST_F(CompressCommand, FailuresAndUsage) {
@@ -52,8 +42,7 @@ TEST_F(CompressCommand, FailuresAndUsage) {
     EXPECT_FALSE(plat::files::Exists("C:\\dl\\out.txt")) << "a failed expansion leaves no output";
     EXPECT_EQ(Pexupdate("expand 'C:\\dl\\missing.ex_' 'C:\\dl\\out.txt'"), 1);
     EXPECT_EQ(Pexupdate("expand 'C:\\dl\\plain.txt'"), 2);
-    EXPECT_EQ(Pexupdate("compress --help"), 0);
-    EXPECT_EQ(Pexupdate("expand --help"), 0);
+    EXPECT_EQ(Pexupdate("compress --help") + Pexupdate("expand --help"), 0);
 }
 
 }  // namespace
