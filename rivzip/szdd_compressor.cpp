@@ -116,6 +116,7 @@ std::int32_t Compressor::CodeAll() {
         }
         if (Available() == 0) break;
         if (!CodeStep()) return kRivzipWriteError;
+        reporter_.SetIo(end_, writer_.Written());
         reporter_.Advance(static_cast<std::uint32_t>(next_));
     }
     if (end_ < input_.length) return kRivzipTruncated;

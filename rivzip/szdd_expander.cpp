@@ -159,6 +159,7 @@ std::int32_t Expander::DecodeAll(std::uint64_t declared) {
     for (;;) {
         std::uint64_t produced = Produced();
         if (produced > declared) return kRivzipLengthMismatch;
+        reporter_.SetIo(read_, written_);
         reporter_.Advance(static_cast<std::uint32_t>(produced));
         if (out_ >= flushAt && !Flush()) return kRivzipWriteError;
         if (inEnd_ - in_ < kMaxGroupInput && !eof_) {
