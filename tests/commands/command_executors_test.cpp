@@ -102,7 +102,7 @@ TEST(ExecuteRun, AProgramOutlivingTheTimeOutFails) {
     pextest::TestMachine m;
     ShortRunTimeout shortWait(1);
     // The program is left running; it ends by itself soon after the test.
-    EXPECT_EQ(MessageOf("[RUN] pextestprog sleep 1500", "C:\\"), "process failed");
+    EXPECT_EQ(MessageOf("[RUN] pextestprog sleep 500", "C:\\"), "process failed");
 }
 
 TEST(ExecuteDel, BareNamesLieInTheBaseDirectoryOtherPathsAsGiven) {
