@@ -5,7 +5,7 @@
 #include <cstdlib>
 
 #include "diag/trace_log.h"
-#include "manifest/name_normalise.h"
+#include "commands/item_list.h"
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "platform/process.h"
@@ -66,7 +66,7 @@ bool CreateDirectoryTree(const std::string& path) {
 }
 
 std::uint32_t NumberFromText(const std::string& text) {
-    const std::string trimmed = TrimBlanks(text);
+    const std::string trimmed = TrimItem(text);
     const char* p = trimmed.c_str();
     while (*p == ' ' || *p == '\t' || *p == '\n' || *p == '\r' || *p == '\v' || *p == '\f') ++p;
     const bool negative = *p == '-';

@@ -3,5 +3,4 @@
 #pragma once
 #include <string>
 
-std::string TrimBlanks(const std::string& text);  // blanks, tabs and line feeds at both ends
 std::string NormaliseName(const std::string& name);
