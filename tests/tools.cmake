@@ -1,0 +1,6 @@
+# The host program's own commands, run as a person runs them.
+pex_add_test(tools_update_commands_test
+  SOURCES ${CMAKE_CURRENT_SOURCE_DIR}/tools/update_commands_test.cpp
+  LIBS pex_platform)
+target_compile_definitions(tools_update_commands_test PRIVATE PEXUPDATE_PATH="$<TARGET_FILE:pexupdate>")
+add_dependencies(tools_update_commands_test pexupdate Mendler)
