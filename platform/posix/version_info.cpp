@@ -4,6 +4,7 @@
 
 #include "platform/errors.h"
 #include "platform/files.h"
+#include "platform/library.h"
 #include "platform/pe_resources.h"
 #include "platform/posix/elf_section.h"
 
@@ -29,9 +30,16 @@ bool FromImage(const std::string& file, std::string* block) {
 
 }  // namespace
 
+// A bare file name is found by the library search, as GetFileVersionInfo does.
+std::string Located(const std::string& winPath) {
+    if (winPath.find_first_of("\\/:") != std::string::npos) return winPath;
+    const std::string found = lib::SearchFile(winPath);
+    return found.empty() ? winPath : found;
+}
+
 bool ReadBlock(const std::string& winPath, std::string* block) {
     std::string file;
-    if (!files::ReadAll(winPath, &file)) return false;
+    if (!files::ReadAll(Located(winPath), &file)) return false;
     bool found;
     if (pe::LooksLikeImage(file)) {
         found = FromImage(file, block);

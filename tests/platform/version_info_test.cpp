@@ -77,6 +77,10 @@ TEST(VersionInfo, OurStampedProgramAndModules) {
     EXPECT_EQ(StringOf(selfReg, "\\StringFileInfo\\040904E4\\OLESelfRegister"), "");
     EXPECT_EQ(StringOf(noSelfReg, "\\StringFileInfo\\040904E4\\OLESelfRegister"), "<none>");
     EXPECT_EQ(StringOf(selfReg, "\\StringFileInfo\\040904E4\\OriginalFilename"), "PexSelfReg.dll");
+    // A bare name is found by the library search, as GetFileVersionInfo finds it.
+    VersionInfo byName;
+    ASSERT_TRUE(plat::ver::Read("PexSelfReg.dll", &byName));
+    EXPECT_EQ(StringOf(byName, "\\StringFileInfo\\040904E4\\OriginalFilename"), "PexSelfReg.dll");
 }
 
 TEST(VersionInfo, FilesWithoutVersionInformation) {
