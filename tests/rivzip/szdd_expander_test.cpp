@@ -112,7 +112,8 @@ TEST(SzddExpander, ReportsStartOneReportPerBlockAndEnd) {
     // A failure still ends what it started; a file that is no SZDD starts nothing.
     Bytes cut = Compress(TextLike(10000, 18));
     cut.resize(cut.size() / 2);
-    MemorySource source(cut), other(Bytes(100, 'x'));
+    Bytes notSzdd(100, 'x');
+    MemorySource source(cut), other(notSzdd);
     MemorySink sink;
     Reports().clear();
     EXPECT_EQ(rivzip::ExpandSzdd(source, sink, &Record), kRivzipTruncated);
