@@ -48,6 +48,13 @@ public:
     bool SetField(std::int32_t row, const std::string& column, const std::string& value);
     bool DiscardContentFile();
 
+    // --- analysis ---
+    std::uint32_t DetermineDownloadtype(const std::string& parties);
+    static std::string sGetInterestedPartiesInformation(const std::string& component);
+    static std::uint32_t ConvertCompressionType(const std::string& name);
+    static std::uint32_t PickBest(std::uint32_t last, const std::set<std::uint32_t>& supported);
+    static std::uint32_t NextWorst(std::uint32_t type);
+
     // Read access for tests and tools.
     const CContentTable& Table() const { return table_; }
     CContentTable& Table() { return table_; }
