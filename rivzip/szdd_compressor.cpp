@@ -49,7 +49,6 @@ private:
     std::uint64_t next_ = 0;  // first position not yet coded
     std::uint64_t end_ = 0;   // end of the bytes read so far
     bool eof_ = false;
-    bool readError_ = false;
 };
 
 // Slides the buffer so that it keeps the matcher's history, then reads until it is full or the
