@@ -6,7 +6,8 @@
 set -euo pipefail
 cd "$(dirname "$0")"
 
-PACKAGES=(cmake make g++ pkg-config libgtest-dev libgmock-dev libsqlite3-dev zlib1g-dev flex bison)
+PACKAGES=(cmake make g++ pkg-config libgtest-dev libgmock-dev libsqlite3-dev zlib1g-dev flex bison
+          mscompress libmspack-dev)
 BUILD=build
 
 install_missing() {
