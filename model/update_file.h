@@ -1,0 +1,99 @@
+// CFile_: one update file of a product run, made from a content-file row that the analysis
+// admitted. It decompresses its downloaded copy, backs up the file it replaces, copies itself
+// into place (queueing the copy for the next restart when the target is in use), stamps the
+// target's date, runs its install commands and can undo all of that. Every operation reports
+// by its result and by trace lines; none throws.
+//
+// The target is HomeDir (with a backslash added) joined with the name and extension of
+// FileName; a directory inside FileName is ignored.
+#pragma once
+#include <cstdint>
+#include <string>
+
+#include "entry/progress_data.h"
+
+class CFile_ {
+public:
+    // Apply's results.
+    static constexpr std::int32_t kApplied = 1;
+    static constexpr std::int32_t kNotApplied = 0;
+    static constexpr std::int32_t kCommandsFailed = 4;
+
+    // Stores the row's values; applied counts only for a downloaded file. No backup yet.
+    CFile_(std::uint32_t row, bool downloaded, bool applied, const std::string& homeDir,
+           const std::string& fileName, const std::string& downLoadCacheFile,
+           const std::string& command, const std::string& updateDate, bool needsDecompression,
+           std::uint32_t compressionType);
+    CFile_(const CFile_& other);  // every field, traced: groups hold copies
+    CFile_& operator=(const CFile_& other) = default;
+
+    std::uint32_t GetRow() const { return Row; }
+    std::string GetFileName() const { return FileName; }
+    bool IsDownloaded() const;
+    bool IsApplied() const;
+    bool IsDecompressionNeeded() const { return NeedsDecompression; }
+    bool IsMandatory() const { return true; }  // no row makes a file optional
+
+    // Expands the downloaded copy in place through the process-wide decompressor, created on
+    // first use. True when the copy is ready; then no further decompression is needed.
+    bool Decompress(ProgressCallback callback);
+
+    // path + ".$bak$", with "x" appended until no file or folder has that name.
+    std::string MakeBackupFileName(std::string path) const;
+
+    // Backs up an existing target, copies the download over it, dates it and runs the install
+    // commands. kApplied: in place and the commands succeeded (also when already applied).
+    // kNotApplied: nothing new is in place, the backup failed, or the copy had to go through
+    // the setup service (installed there, queued for restart, or failed). kCommandsFailed: the
+    // new file is in place but the commands failed or threw; Rollback undoes it.
+    std::int32_t Apply();
+
+    // Stamps creation, access and write time of the file with UpdateDate, read as universal
+    // time after cutting UpdateDate at its first "." (the field keeps the cut text). False, with
+    // a trace line, when the text is no date or the file cannot be opened or stamped.
+    bool SetFileDateTime(std::string path);
+
+    // True when the file is absent or writable afterwards.
+    bool ClearReadOnly(std::string path) const;
+
+    // Restores the state before Apply: the backup copied back (then removed), or the installed
+    // file deleted when there was no previous target. A file whose new copy never reached the
+    // target only loses its backup. Clears Applied. False when the restore or deletion failed;
+    // the backup is then kept and a later Rollback tries again.
+    bool Rollback();
+
+    // Deletes the backup; true when none is left behind. A backup that holds the only copy of
+    // the target's previous version (the new file is in place but not applied) is kept: false.
+    bool RemoveBackupFile();
+
+    // Deletes the downloaded copy; true when the deletion succeeded.
+    bool Remove();
+
+private:
+    std::string TargetDirectory() const;
+    std::string TargetPath() const;
+    std::int32_t Install();
+    bool PreserveTarget(const std::string& target);
+    void InstallThroughSetup(const std::string& target);
+    std::int32_t RunCommands();
+    bool Undo();
+    bool RestoreTarget(const std::string& target);
+
+    std::uint32_t Row;
+    std::string FileName;
+    std::string DownLoadCacheFile;
+    std::uint32_t CompressionType;
+    bool Downloaded;
+    bool Applied;
+    std::string BackupFileName;
+    std::string Command;
+    std::string HomeDir;
+    bool NeedsDecompression;
+    std::string UpdateDate;
+    // The new file has reached the target and has not been rolled back yet, whether or not it
+    // counts as applied (its commands may have failed). While this holds, the target's previous
+    // state is recorded once and for all: in BackupFileName, or, when that is empty, as "there
+    // was no target". So no later Apply backs the target up again (that would put this file's
+    // own copy into the backup) and no RemoveBackupFile of an unapplied file deletes the backup.
+    bool TargetReplaced = false;
+};
