@@ -1,6 +1,7 @@
 // CDecompressionObjects: expands a downloaded file in place according to its compression code.
-// LZW files are expanded by the external library Rivzip.dll, loaded on demand; the state is
-// process-wide and shared by every instance.
+// LZW files are expanded by the external library Rivzip.dll, loaded on demand; ZLIB files by
+// zlib, linked in. The state is process-wide and shared by every instance, unguarded: one run
+// at a time, on the caller's thread.
 #pragma once
 #include <cstdint>
 #include <string>
@@ -15,32 +16,54 @@ enum CompressionCode : std::uint32_t {
     kCompressionRTPatch = 3,
 };
 
-// The record through which Rivzip.dll reports progress; only these four fields are read here.
+// The record through which Rivzip.dll reports progress (rivzip/compress_performance.h); only its
+// starting flag, processed amount, ending flag and total amount are read here.
 struct SCompressPerformance;
 
 class CDecompressionObjects {
 public:
     CDecompressionObjects();  // calls Load
 
-    // True when the file at path is ready to use (expanded, or needing no expansion).
+    // True when the file at path is ready to use: expanded in place, or needing no expansion.
+    // False for an unknown code and for every failed expansion; the file at path then still
+    // holds the download as it was (see DecompressLZW).
     bool Decompress(std::uint32_t type, const std::string& path, ProgressCallback callback);
+    // True; the file is left as it is.
     bool DecompressNone(const std::string& path, ProgressCallback callback);
+    // Expands the SZDD file at path in place through Rivzip.dll, by way of a temporary copy;
+    // progress goes to callback. On failure the download is left as it was: a failure before the
+    // file is opened for writing does not touch it, and after a failed expansion the compressed
+    // data is copied back from the temporary copy (which is kept, and named in the log, only
+    // when that copy back fails). No temporary file remains otherwise.
     bool DecompressLZW(const std::string& path, ProgressCallback callback);
+    // As DecompressLZW for a zlib or gzip stream (concatenated gzip members included), expanded
+    // with zlib; data that is corrupt, truncated or followed by anything else fails.
     bool DecompressZLib(const std::string& path, ProgressCallback callback);
+    // False: there is no patch engine, so a patch is never installed as the file itself.
     bool DecompressRTPatch(const std::string& path, ProgressCallback callback);
 
     // Both always report success; the outcome shows in whether the expand entry is set.
+    // Load does nothing while a library is loaded, even one without the expand entry.
     bool Load();
     bool Unload();
+    // True while a library is loaded (with or without its expand entry).
     static bool IsLoaded();
+    // The candidate text that loaded the current library; empty when none is loaded.
+    static std::string LoadedFrom();
 
-    // Candidates for the library's location, tried in this order.
+    // Candidates for the library's location, tried in this order. Each gives the text handed to
+    // the library loader; an empty text (GetRegistryPath's failures) never loads.
     std::string GetRegistryPath();
     std::string GetDefaultPath1();
     std::string GetDefaultPath2();
     std::string GetDefaultPath3();
     std::string GetDLL();
 
-    // The progress function handed to the library.
+    // The progress function handed to the library: forwards a thinned-out selection of the
+    // reports (every start, the first report after it and every 2500th, every end) to the
+    // stored callback through g_ProgressData, amounts shifted right by 3.
     static void ExpandProgress(SCompressPerformance& performance);
+    // Stores the callback that ExpandProgress reports to (null: none). DecompressLZW and
+    // DecompressZLib store theirs.
+    static void SetProgressCallback(ProgressCallback callback);
 };
