@@ -1,0 +1,298 @@
+// CFile_ on an emulated machine: installing over an absent, present, read-only and in-use
+// target, the date stamp, install commands, and rollbacks that never lose the previous version.
+#include "model/update_file.h"
+
+#include <gtest/gtest.h>
+
+#include <string>
+#include <vector>
+
+#include "platform/cfile.h"
+#include "platform/errors.h"
+#include "platform/fault.h"
+#include "platform/files.h"
+#include "platform/setup_install.h"
+#include "tests/support/test_machine.h"
+#include "tests/support/trace_capture.h"
+
+namespace {
+
+using Lines = std::vector<std::string>;
+
+constexpr char kDownload[] = "C:\\Cache\\a.dll";
+constexpr char kTarget[] = "C:\\App\\Sub\\a.dll";
+constexpr char kBackup[] = "C:\\App\\Sub\\a.dll.$bak$";
+
+class UpdateFile : public ::testing::Test {
+protected:
+    void SetUp() override { machine.WriteFile(kDownload, "new"); }
+    void TearDown() override { plat::fault::Clear(); }
+
+    // Row 7, installed into C:\App\Sub; the directory in the file name is not used.
+    static CFile_ Make(const std::string& command = "", const std::string& date = "") {
+        return CFile_(7, true, false, "C:\\App\\Sub", "Dist\\a.dll", kDownload, command, date,
+                      false, 0);
+    }
+    std::string Read(const std::string& path) const { return machine.ReadFile(path); }
+    static bool Exists(const std::string& path) { return plat::files::Exists(path); }
+
+    pextest::TestMachine machine;
+    pextest::TraceCapture trace;
+};
+
+TEST_F(UpdateFile, AppliedOnlyWhenDownloadedAndCopiesKeepEveryField) {
+    EXPECT_FALSE(CFile_(1, false, true, "C:\\App", "a.dll", kDownload, "", "", true, 2).IsApplied());
+    const CFile_ original(2, true, true, "C:\\App", "a.dll", kDownload, "", "", true, 2);
+    const CFile_ copy(original);
+    EXPECT_TRUE(copy.IsApplied());
+    EXPECT_TRUE(copy.IsDownloaded());
+    EXPECT_TRUE(copy.IsDecompressionNeeded());
+    EXPECT_EQ(2u, copy.GetRow());
+    EXPECT_EQ(trace.Lines(), (Lines{
+        "CFile_: Standard Application constructor complete for item @ 1",
+        "File 'a.dll' is not applied",
+        "CFile_: Standard Application constructor complete for item @ 2",
+        "CFile_: STL constructor complete for item @ 2",
+        "File 'a.dll' is applied",
+        "CFile_: IsDownloaded 1 for file 'a.dll', row 2",
+    }));
+}
+
+TEST_F(UpdateFile, NewTargetNeedsNoBackupAndItsRollbackDeletesIt) {
+    CFile_ file = Make();
+    trace.Clear();
+    EXPECT_EQ(1, file.Apply());
+    EXPECT_EQ("new", Read(kTarget));
+    EXPECT_EQ(trace.Lines(), (Lines{
+        "CFile_: Apply",
+        "CFile_: Applying file 'Dist\\a.dll'",
+        "CFile_: Backup not needed, no instance of target file on system to back up...",
+        "CFile_: Copy successful, source is (C:\\Cache\\a.dll), target is (C:\\App\\Sub\\a.dll)",
+        "CFile_: SetFileDateTime, Unable to parse provided date time string ''",
+        "CFile_: No Commands found",
+        "CFile_: return value is 1",
+    }));
+
+    // Applied once is applied: nothing is copied again.
+    machine.WriteFile(kDownload, "newer");
+    trace.Clear();
+    EXPECT_EQ(1, file.Apply());
+    EXPECT_EQ("new", Read(kTarget));
+    EXPECT_TRUE(trace.Contains("CFile_: File 'Dist\\a.dll' already applied, no action taken"));
+
+    trace.Clear();
+    EXPECT_TRUE(file.Rollback());
+    EXPECT_FALSE(Exists(kTarget));
+    EXPECT_FALSE(file.IsApplied());
+    EXPECT_EQ(trace.Lines(), (Lines{
+        "CFile_: Rollback",
+        "CFile_: No backup file name, removing original",
+        "CFile_: Rollback returning 1",
+        "File 'Dist\\a.dll' is not applied",
+    }));
+
+    EXPECT_TRUE(file.Remove());
+    EXPECT_FALSE(Exists(kDownload));
+    EXPECT_FALSE(file.Remove());
+}
+
+TEST_F(UpdateFile, ExistingTargetIsBackedUpBesideAnyOlderBackupAndRestored) {
+    machine.WriteFile(kTarget, "old");
+    machine.WriteFile(kBackup, "someone else's");
+    CFile_ file = Make();
+    EXPECT_EQ(1, file.Apply());
+    EXPECT_EQ("new", Read(kTarget));
+    EXPECT_EQ("old", Read(std::string(kBackup) + "x"));
+    EXPECT_TRUE(trace.Contains("CFile_: MakeBackupFileName, about to try 'C:\\App\\Sub\\a.dll.$bak$x'"));
+    EXPECT_TRUE(trace.Contains("CFile_: Backup successful..."));
+
+    trace.Clear();
+    EXPECT_TRUE(file.Rollback());
+    EXPECT_EQ("old", Read(kTarget));
+    EXPECT_FALSE(Exists(std::string(kBackup) + "x"));
+    EXPECT_EQ("someone else's", Read(kBackup));
+    EXPECT_EQ(trace.Lines(), (Lines{
+        "CFile_: Rollback",
+        "CFile_: Rolling back...",
+        "CFile_: Rollback filecopy success",
+        "CFile_: RemoveBackupFile, backup file name is 'C:\\App\\Sub\\a.dll.$bak$x'",
+        "CFile_: RemoveBackupFile, returning 1",
+        "CFile_: Rollback returning 1",
+    }));
+
+    // A retried apply reuses the name, now free again.
+    EXPECT_EQ(1, file.Apply());
+    EXPECT_EQ("old", Read(std::string(kBackup) + "x"));
+}
+
+TEST_F(UpdateFile, ReadOnlyTargetIsClearedAndReplaced) {
+    machine.WriteFile(kTarget, "old");
+    ASSERT_TRUE(plat::files::SetAttributes(kTarget, plat::files::kAttrReadOnly));
+    CFile_ file = Make();
+    EXPECT_EQ(1, file.Apply());
+    EXPECT_EQ("new", Read(kTarget));
+    EXPECT_EQ("old", Read(kBackup));
+    EXPECT_TRUE(file.RemoveBackupFile());  // the backup is writable, so it can go
+    EXPECT_FALSE(Exists(kBackup));
+}
+
+TEST_F(UpdateFile, FailedBackupLeavesTheTargetAlone) {
+    machine.WriteFile(kTarget, "old");
+    CFile_ file = Make();
+    plat::fault::FailNth(plat::fault::Op::Copy, 1, plat::kErrorDiskFull);
+    EXPECT_EQ(0, file.Apply());
+    EXPECT_EQ("old", Read(kTarget));
+    EXPECT_TRUE(trace.Contains(
+        "CFile_: Backup of file Dist\\a.dll to C:\\App\\Sub\\a.dll.$bak$ failed, reason code is 112"));
+    EXPECT_TRUE(file.Rollback());
+    EXPECT_TRUE(trace.Contains("CFile_: file 'Dist\\a.dll' not applied, no rollback action needed"));
+    EXPECT_EQ("old", Read(kTarget));
+}
+
+// The stamp is the text's clock time as universal time, whatever follows a ".".
+TEST_F(UpdateFile, DateIsStampedAsUniversalTimeAndABadDateOnlyCostsTheStamp) {
+    CFile_ file = Make("", "12/31/2003 22:30:00.250");
+    EXPECT_EQ(1, file.Apply());
+    plat::files::FileStatus status;
+    ASSERT_TRUE(plat::files::GetStatus(kTarget, &status));
+    constexpr plat::files::FileTime k20031231_223000 = 127173834000000000ull;
+    EXPECT_EQ(k20031231_223000, status.lastWrite);
+    EXPECT_EQ(k20031231_223000, status.lastAccess);
+    EXPECT_TRUE(trace.Contains("CFile_: SetFileDateTime, success setting file time for "
+                               "'C:\\App\\Sub\\a.dll' to 12/31/2003 22:30:00"));
+
+    plat::files::FileStatus download;
+    ASSERT_TRUE(plat::files::GetStatus(kDownload, &download));
+    CFile_ undated = Make("", "next Tuesday");
+    ASSERT_TRUE(file.Rollback());
+    EXPECT_EQ(1, undated.Apply());
+    ASSERT_TRUE(plat::files::GetStatus(kTarget, &status));
+    EXPECT_EQ(download.lastWrite, status.lastWrite);  // as the copy left it
+    EXPECT_TRUE(trace.Contains(
+        "CFile_: SetFileDateTime, Unable to parse provided date time string 'next Tuesday'"));
+
+    CFile_ tooEarly = Make("", "1/1/1600");
+    EXPECT_FALSE(tooEarly.SetFileDateTime(kTarget));
+    EXPECT_TRUE(trace.Contains("CFile_: SetFileDateTime, Unable to convert System Time object to "
+                               "File Time object. GetLastError returns 87"));
+    EXPECT_FALSE(file.SetFileDateTime("C:\\App\\Sub\\missing.dll"));
+    EXPECT_TRUE(trace.Contains("CFile_: SetFileDateTime, Unable to open 'C:\\App\\Sub\\missing.dll'. "
+                               "GetLastError returns 2"));
+}
+
+TEST_F(UpdateFile, InstallCommandsRunInTheHomeDirectory) {
+    machine.WriteFile("C:\\App\\Sub\\old.txt", "x");
+    CFile_ file = Make("[DEL] old.txt");
+    EXPECT_EQ(1, file.Apply());
+    EXPECT_FALSE(Exists("C:\\App\\Sub\\old.txt"));
+    EXPECT_TRUE(file.IsApplied());
+
+    // Blanks are a command text: it is run, and finds nothing to do.
+    CFile_ blanks = Make("   ");
+    ASSERT_TRUE(file.Rollback());
+    EXPECT_EQ(1, blanks.Apply());
+    EXPECT_TRUE(trace.Contains("CFile_: Command(s) found:    "));
+}
+
+// Result 4 leaves the new file in place, not applied; Rollback still puts the old one back.
+TEST_F(UpdateFile, FailingCommandsGiveFourAndRollbackRestoresTheTarget) {
+    machine.WriteFile(kTarget, "old");
+    for (const char* command : {"[DEL] missing.txt", "[TRY-DEL] missing.txt"}) {
+        SCOPED_TRACE(command);
+        trace.Clear();
+        CFile_ file = Make(command);
+        EXPECT_EQ(4, file.Apply());
+        EXPECT_EQ("new", Read(kTarget));
+        EXPECT_FALSE(file.IsApplied());
+        EXPECT_EQ(std::string(command) == "[DEL] missing.txt",
+                  trace.Contains("CFile_: Command execution threw error"));
+        EXPECT_TRUE(trace.Contains("CFile_: return value is 4"));
+
+        EXPECT_FALSE(file.RemoveBackupFile());  // the only copy of "old"
+        EXPECT_EQ("old", Read(kBackup));
+        EXPECT_TRUE(file.Rollback());
+        EXPECT_TRUE(trace.Contains(
+            "CFile_: file 'Dist\\a.dll' not applied, but its copy is in place, rolling back"));
+        EXPECT_EQ("old", Read(kTarget));
+        EXPECT_FALSE(Exists(kBackup));
+    }
+}
+
+// A program holds the target open (it may be read, not replaced): the copy goes to the restart
+// queue, and the file does not count as applied, so neither date nor commands happen.
+TEST_F(UpdateFile, InUseTargetIsQueuedForRestartAndNotApplied) {
+    machine.WriteFile(kTarget, "old");
+    machine.WriteFile("C:\\App\\Sub\\marker.txt", "x");
+    plat::CFile running;
+    ASSERT_TRUE(running.Open(kTarget, plat::CFile::modeRead | plat::CFile::shareDenyWrite));
+    CFile_ file = Make("[DEL] marker.txt", "1/2/2004");
+    EXPECT_EQ(0, file.Apply());
+    EXPECT_FALSE(file.IsApplied());
+    EXPECT_EQ("old", Read(kTarget));
+    EXPECT_TRUE(Exists("C:\\App\\Sub\\marker.txt"));
+    EXPECT_TRUE(trace.Contains(
+        "CFile_: Copy not successfull, reason code is 32, source was (C:\\Cache\\a.dll), target was "
+        "(C:\\App\\Sub\\a.dll), retrying with SetupAPI"));
+    EXPECT_TRUE(trace.Contains(
+        "CFile_: SetupInstallFileEx succeeded, but the file was in use.  It has been queued to be "
+        "installed on the next system reboot."));
+
+    std::vector<plat::setup::PendingRename> queue;
+    ASSERT_TRUE(plat::setup::ReadPendingRenames(&queue));
+    ASSERT_EQ(1u, queue.size());
+    EXPECT_EQ(kTarget, queue[0].to);
+    EXPECT_EQ("new", Read(queue[0].from));
+}
+
+TEST_F(UpdateFile, SetupFallbackCountsAsNotAppliedButIsUndoneWhenItInstalled) {
+    plat::fault::FailNth(plat::fault::Op::Copy, 1, plat::kErrorAccessDenied);
+    CFile_ file = Make();
+    EXPECT_EQ(0, file.Apply());
+    EXPECT_EQ("new", Read(kTarget));
+    EXPECT_TRUE(trace.Contains("CFile_: SetupInstallFileEx succeeded."));
+    EXPECT_TRUE(file.Rollback());
+    EXPECT_FALSE(Exists(kTarget));
+
+    CFile_ missing(8, true, false, "C:\\App\\Sub", "b.dll", "C:\\Cache\\b.dll", "", "", false, 0);
+    EXPECT_EQ(0, missing.Apply());
+    EXPECT_TRUE(trace.Contains("CFile_: SetupInstallFileEx failed, error code is 2"));
+}
+
+// A restore that fails keeps the backup through every later step until a restore succeeds.
+TEST_F(UpdateFile, FailedRestoreNeverLosesThePreviousVersion) {
+    machine.WriteFile(kTarget, "old");
+    CFile_ file = Make();
+    ASSERT_EQ(1, file.Apply());
+    plat::fault::FailNth(plat::fault::Op::Copy, 1, plat::kErrorSharingViolation);
+    EXPECT_FALSE(file.Rollback());
+    plat::fault::Clear();
+    EXPECT_FALSE(file.IsApplied());
+    EXPECT_EQ("new", Read(kTarget));
+    EXPECT_TRUE(trace.Contains("CFile_: Rollback failed, retrying, error code is 32"));
+
+    // The clean-up's RemoveBackupFile and a retried Apply both leave the backup alone.
+    EXPECT_FALSE(file.RemoveBackupFile());
+    EXPECT_TRUE(trace.Contains("CFile_: RemoveBackupFile, keeping 'C:\\App\\Sub\\a.dll.$bak$': it "
+                               "holds the only copy of the previous version of 'Dist\\a.dll'"));
+    EXPECT_EQ(1, file.Apply());
+    EXPECT_EQ("old", Read(kBackup));
+    EXPECT_TRUE(trace.Contains("CFile_: Backup not taken, the target is this file's earlier copy; "
+                               "its previous version stays in 'C:\\App\\Sub\\a.dll.$bak$'"));
+
+    EXPECT_TRUE(file.Rollback());
+    EXPECT_EQ("old", Read(kTarget));
+    EXPECT_FALSE(Exists(kBackup));
+}
+
+TEST_F(UpdateFile, FailedDeletionOfANewTargetIsRetriedByTheNextRollback) {
+    CFile_ file = Make();
+    ASSERT_EQ(1, file.Apply());
+    plat::fault::FailNth(plat::fault::Op::Remove, 1, plat::kErrorSharingViolation);
+    EXPECT_FALSE(file.Rollback());
+    plat::fault::Clear();
+    EXPECT_TRUE(Exists(kTarget));
+    EXPECT_TRUE(file.Rollback());
+    EXPECT_FALSE(Exists(kTarget));
+}
+
+}  // namespace
