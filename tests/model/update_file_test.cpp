@@ -3,6 +3,7 @@
 #include "model/update_file.h"
 
 #include <gtest/gtest.h>
+#include <zlib.h>
 
 #include <string>
 #include <vector>
@@ -56,6 +57,29 @@ TEST_F(UpdateFile, AppliedOnlyWhenDownloadedAndCopiesKeepEveryField) {
         "File 'a.dll' is applied",
         "CFile_: IsDownloaded 1 for file 'a.dll', row 2",
     }));
+}
+
+// One decompressor serves every file of the process; a failure leaves the file to decompress.
+TEST_F(UpdateFile, DecompressesInPlaceThroughOneSharedDecompressor) {
+    const std::string plain(4000, 'p');
+    std::string packed(compressBound(plain.size()), '\0');
+    uLongf size = packed.size();
+    ASSERT_EQ(Z_OK, compress(reinterpret_cast<Bytef*>(packed.data()), &size,
+                             reinterpret_cast<const Bytef*>(plain.data()), plain.size()));
+    machine.WriteFile(kDownload, packed.substr(0, size));
+    CFile_ zlib(1, true, false, "C:\\App", "a.dll", kDownload, "", "", true, 2);
+    EXPECT_TRUE(zlib.Decompress(nullptr));
+    EXPECT_FALSE(zlib.IsDecompressionNeeded());
+    EXPECT_EQ(plain, Read(kDownload));
+    EXPECT_TRUE(trace.Contains("CFile_::Decompress, creating Decompressor"));
+    EXPECT_TRUE(trace.Contains("CFile_::Decompress return value is 1"));
+
+    trace.Clear();
+    CFile_ patch(2, true, false, "C:\\App", "a.dll", kDownload, "", "", true, 3);
+    EXPECT_FALSE(patch.Decompress(nullptr));
+    EXPECT_TRUE(patch.IsDecompressionNeeded());
+    EXPECT_FALSE(trace.Contains("CFile_::Decompress, creating Decompressor"));
+    EXPECT_TRUE(trace.Contains("CFile_::Decompress return value is 0"));
 }
 
 TEST_F(UpdateFile, NewTargetNeedsNoBackupAndItsRollbackDeletesIt) {
