@@ -1,5 +1,4 @@
-// CFileGroup: the dependency-list rules, the order of members and names, and the group's
-// decompressed and applied states.
+// CFileGroup: the dependency-list rules and the group's decompressed and applied states.
 #include "model/file_group.h"
 
 #include <gtest/gtest.h>
@@ -13,7 +12,6 @@
 
 namespace {
 
-using Lines = std::vector<std::string>;
 using Names = std::set<std::string>;
 
 CFile_ Member(std::uint32_t row, bool applied, bool needsDecompression) {
@@ -21,7 +19,7 @@ CFile_ Member(std::uint32_t row, bool applied, bool needsDecompression) {
                   "C:\\Cache\\f.dll", "", "", needsDecompression, 1);
 }
 
-TEST(FileGroupDependancies, ListsSplitAtSemicolonsWithTrimmedItems) {
+TEST(FileGroup, DependancyListsSplitAtSemicolonsIntoTrimmedNamesKeptAsWritten) {
     struct Case {
         const char* text;
         bool result;
@@ -30,11 +28,10 @@ TEST(FileGroupDependancies, ListsSplitAtSemicolonsWithTrimmedItems) {
     const Case cases[] = {
         {"A; B", true, {"A", "B"}},
         {"A;  \t", true, {"A"}},
-        {"", true, {}},
         {" \n ", true, {}},
         {"A;;B", true, {"", "A", "B"}},
         {";A", true, {"", "A"}},
-        {"A;a; A", false, {"A", "a"}},
+        {"A;a; A", false, {"A", "a"}},  // the repeat is reported and kept once
         {"b\r;A", true, {"A", "b\r"}},  // carriage returns are kept
     };
     for (const Case& c : cases) {
@@ -44,45 +41,14 @@ TEST(FileGroupDependancies, ListsSplitAtSemicolonsWithTrimmedItems) {
     }
 }
 
-TEST(FileGroupDependancies, NamesKeepTheirCaseInByteOrder) {
-    CFileGroup group("G");
-    group.AddDependancies("core;\xC3\xA9t\xC3\xA9;CORE;_x;Base");
-    const std::vector<std::string> order(group.GetDependancies().begin(),
-                                         group.GetDependancies().end());
-    EXPECT_EQ(order, (std::vector<std::string>{"Base", "CORE", "_x", "core", "\xC3\xA9t\xC3\xA9"}));
-}
-
-TEST(FileGroupDependancies, ARepeatedNameIsTracedAndReportedButTheFileStays) {
+TEST(FileGroup, MembersKeepTheirOrderAndTheFirstUnappliedOneDecides) {
     pextest::TestMachine machine;
     CFileGroup group("G");
-    const CFile_ file = Member(1, false, false);
-    pextest::TraceCapture trace;
-    EXPECT_FALSE(group.AddFileAndDependancies(file, "A;A"));
-    EXPECT_EQ(1u, group.GetFiles().size());
-    EXPECT_EQ(trace.Lines(), (Lines{
-        "CFile_: STL constructor complete for item @ 1",
-        "CFileGroup: AddFileToGroup, before was 0, now is 1",
-        "CFileGroup: AddDependancies, input is 'A;A'",
-        "CFileGroup: AddDependancy, input is 'A'",
-        "CFileGroup: AddDependancy, before was 0 now is 1",
-        "CFileGroup: AddDependancy, input is 'A'",
-        "CFileGroup: AddDependancy, before was 1 now is 1",
-        "CFileGroup: AddDependancies, return value is 0",
-    }));
-}
-
-TEST(FileGroupStates, AnEmptyGroupIsDecompressedAndApplied) {
-    const CFileGroup group("G");
-    EXPECT_TRUE(group.IsGroupDecompressed());
     EXPECT_TRUE(group.IsGroupApplied());
-}
-
-TEST(FileGroupStates, MembersKeepTheirOrderAndTheFirstUnappliedOneDecides) {
-    pextest::TestMachine machine;
-    CFileGroup group("G");
+    EXPECT_TRUE(group.IsGroupDecompressed());
     group.AddFileToGroup(Member(3, true, false));
     group.AddFileToGroup(Member(1, false, true));
-    group.AddFileToGroup(Member(2, false, false));
+    EXPECT_TRUE(group.AddFileAndDependancies(Member(2, false, false), ""));
     std::vector<std::uint32_t> rows;
     for (const CFile_& file : group.GetFiles()) rows.push_back(file.GetRow());
     EXPECT_EQ(rows, (std::vector<std::uint32_t>{3, 1, 2}));
@@ -90,25 +56,12 @@ TEST(FileGroupStates, MembersKeepTheirOrderAndTheFirstUnappliedOneDecides) {
     pextest::TraceCapture trace;
     EXPECT_FALSE(group.IsGroupApplied());
     EXPECT_FALSE(group.IsGroupDecompressed());
-    EXPECT_EQ(trace.Lines(), (Lines{
+    EXPECT_EQ(trace.Lines(), (std::vector<std::string>{
         "File 'f3.dll' is applied",
         "File 'f1.dll' is not applied",
         "CFileGroup: IsGroupApplied complete 0",
         "CFileGroup: IsGroupDecompressed complete 0",
     }));
-}
-
-TEST(FileGroupStates, ACopyCarriesMembersNamesAndRetries) {
-    CFileGroup group("Core");
-    group.AddFileAndDependancies(Member(1, true, false), "Base");
-    EXPECT_TRUE(group.IncrementRetries());
-    group.IncrementRetries();
-    const CFileGroup copy(group);
-    EXPECT_EQ("Core", copy.GetName());
-    EXPECT_EQ(2, copy.GetRetries());
-    EXPECT_EQ(Names{"Base"}, copy.GetDependancies());
-    EXPECT_EQ(1u, copy.GetFiles().size());
-    EXPECT_TRUE(copy.IsGroupApplied());
 }
 
 }  // namespace

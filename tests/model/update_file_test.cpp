@@ -41,24 +41,6 @@ protected:
     pextest::TraceCapture trace;
 };
 
-TEST_F(UpdateFile, AppliedOnlyWhenDownloadedAndCopiesKeepEveryField) {
-    EXPECT_FALSE(CFile_(1, false, true, "C:\\App", "a.dll", kDownload, "", "", true, 2).IsApplied());
-    const CFile_ original(2, true, true, "C:\\App", "a.dll", kDownload, "", "", true, 2);
-    const CFile_ copy(original);
-    EXPECT_TRUE(copy.IsApplied());
-    EXPECT_TRUE(copy.IsDownloaded());
-    EXPECT_TRUE(copy.IsDecompressionNeeded());
-    EXPECT_EQ(2u, copy.GetRow());
-    EXPECT_EQ(trace.Lines(), (Lines{
-        "CFile_: Standard Application constructor complete for item @ 1",
-        "File 'a.dll' is not applied",
-        "CFile_: Standard Application constructor complete for item @ 2",
-        "CFile_: STL constructor complete for item @ 2",
-        "File 'a.dll' is applied",
-        "CFile_: IsDownloaded 1 for file 'a.dll', row 2",
-    }));
-}
-
 // One decompressor serves every file of the process; a failure leaves the file to decompress.
 TEST_F(UpdateFile, DecompressesInPlaceThroughOneSharedDecompressor) {
     const std::string plain(4000, 'p');
@@ -72,7 +54,6 @@ TEST_F(UpdateFile, DecompressesInPlaceThroughOneSharedDecompressor) {
     EXPECT_FALSE(zlib.IsDecompressionNeeded());
     EXPECT_EQ(plain, Read(kDownload));
     EXPECT_TRUE(trace.Contains("CFile_::Decompress, creating Decompressor"));
-    EXPECT_TRUE(trace.Contains("CFile_::Decompress return value is 1"));
 
     trace.Clear();
     CFile_ patch(2, true, false, "C:\\App", "a.dll", kDownload, "", "", true, 3);
@@ -96,28 +77,15 @@ TEST_F(UpdateFile, NewTargetNeedsNoBackupAndItsRollbackDeletesIt) {
         "CFile_: No Commands found",
         "CFile_: return value is 1",
     }));
-
-    // Applied once is applied: nothing is copied again.
     machine.WriteFile(kDownload, "newer");
-    trace.Clear();
-    EXPECT_EQ(1, file.Apply());
+    EXPECT_EQ(1, file.Apply());  // applied once is applied: nothing is copied again
     EXPECT_EQ("new", Read(kTarget));
-    EXPECT_TRUE(trace.Contains("CFile_: File 'Dist\\a.dll' already applied, no action taken"));
 
-    trace.Clear();
     EXPECT_TRUE(file.Rollback());
     EXPECT_FALSE(Exists(kTarget));
-    EXPECT_FALSE(file.IsApplied());
-    EXPECT_EQ(trace.Lines(), (Lines{
-        "CFile_: Rollback",
-        "CFile_: No backup file name, removing original",
-        "CFile_: Rollback returning 1",
-        "File 'Dist\\a.dll' is not applied",
-    }));
-
+    EXPECT_TRUE(trace.Contains("CFile_: No backup file name, removing original"));
     EXPECT_TRUE(file.Remove());
     EXPECT_FALSE(Exists(kDownload));
-    EXPECT_FALSE(file.Remove());
 }
 
 TEST_F(UpdateFile, ExistingTargetIsBackedUpBesideAnyOlderBackupAndRestored) {
@@ -128,49 +96,28 @@ TEST_F(UpdateFile, ExistingTargetIsBackedUpBesideAnyOlderBackupAndRestored) {
     EXPECT_EQ("new", Read(kTarget));
     EXPECT_EQ("old", Read(std::string(kBackup) + "x"));
     EXPECT_TRUE(trace.Contains("CFile_: MakeBackupFileName, about to try 'C:\\App\\Sub\\a.dll.$bak$x'"));
-    EXPECT_TRUE(trace.Contains("CFile_: Backup successful..."));
 
-    trace.Clear();
     EXPECT_TRUE(file.Rollback());
     EXPECT_EQ("old", Read(kTarget));
     EXPECT_FALSE(Exists(std::string(kBackup) + "x"));
     EXPECT_EQ("someone else's", Read(kBackup));
-    EXPECT_EQ(trace.Lines(), (Lines{
-        "CFile_: Rollback",
-        "CFile_: Rolling back...",
-        "CFile_: Rollback filecopy success",
-        "CFile_: RemoveBackupFile, backup file name is 'C:\\App\\Sub\\a.dll.$bak$x'",
-        "CFile_: RemoveBackupFile, returning 1",
-        "CFile_: Rollback returning 1",
-    }));
-
-    // A retried apply reuses the name, now free again.
-    EXPECT_EQ(1, file.Apply());
-    EXPECT_EQ("old", Read(std::string(kBackup) + "x"));
 }
 
-TEST_F(UpdateFile, ReadOnlyTargetIsClearedAndReplaced) {
+TEST_F(UpdateFile, ReadOnlyTargetIsClearedAndReplacedAndAFailedBackupLeavesItAlone) {
     machine.WriteFile(kTarget, "old");
     ASSERT_TRUE(plat::files::SetAttributes(kTarget, plat::files::kAttrReadOnly));
-    CFile_ file = Make();
-    EXPECT_EQ(1, file.Apply());
-    EXPECT_EQ("new", Read(kTarget));
-    EXPECT_EQ("old", Read(kBackup));
-    EXPECT_TRUE(file.RemoveBackupFile());  // the backup is writable, so it can go
-    EXPECT_FALSE(Exists(kBackup));
-}
-
-TEST_F(UpdateFile, FailedBackupLeavesTheTargetAlone) {
-    machine.WriteFile(kTarget, "old");
     CFile_ file = Make();
     plat::fault::FailNth(plat::fault::Op::Copy, 1, plat::kErrorDiskFull);
     EXPECT_EQ(0, file.Apply());
     EXPECT_EQ("old", Read(kTarget));
     EXPECT_TRUE(trace.Contains(
         "CFile_: Backup of file Dist\\a.dll to C:\\App\\Sub\\a.dll.$bak$ failed, reason code is 112"));
-    EXPECT_TRUE(file.Rollback());
-    EXPECT_TRUE(trace.Contains("CFile_: file 'Dist\\a.dll' not applied, no rollback action needed"));
-    EXPECT_EQ("old", Read(kTarget));
+    EXPECT_TRUE(file.Rollback());  // nothing to undo
+
+    EXPECT_EQ(1, file.Apply());
+    EXPECT_EQ("new", Read(kTarget));
+    EXPECT_TRUE(file.RemoveBackupFile());
+    EXPECT_FALSE(Exists(kBackup));
 }
 
 // The stamp is the text's clock time as universal time, whatever follows a ".".
@@ -179,9 +126,7 @@ TEST_F(UpdateFile, DateIsStampedAsUniversalTimeAndABadDateOnlyCostsTheStamp) {
     EXPECT_EQ(1, file.Apply());
     plat::files::FileStatus status;
     ASSERT_TRUE(plat::files::GetStatus(kTarget, &status));
-    constexpr plat::files::FileTime k20031231_223000 = 127173834000000000ull;
-    EXPECT_EQ(k20031231_223000, status.lastWrite);
-    EXPECT_EQ(k20031231_223000, status.lastAccess);
+    EXPECT_EQ(127173834000000000ull, status.lastWrite);  // 2003-12-31 22:30:00 UTC
     EXPECT_TRUE(trace.Contains("CFile_: SetFileDateTime, success setting file time for "
                                "'C:\\App\\Sub\\a.dll' to 12/31/2003 22:30:00"));
 
@@ -192,34 +137,14 @@ TEST_F(UpdateFile, DateIsStampedAsUniversalTimeAndABadDateOnlyCostsTheStamp) {
     EXPECT_EQ(1, undated.Apply());
     ASSERT_TRUE(plat::files::GetStatus(kTarget, &status));
     EXPECT_EQ(download.lastWrite, status.lastWrite);  // as the copy left it
-    EXPECT_TRUE(trace.Contains(
-        "CFile_: SetFileDateTime, Unable to parse provided date time string 'next Tuesday'"));
 
-    CFile_ tooEarly = Make("", "1/1/1600");
-    EXPECT_FALSE(tooEarly.SetFileDateTime(kTarget));
+    EXPECT_FALSE(Make("", "1/1/1600").SetFileDateTime(kTarget));
     EXPECT_TRUE(trace.Contains("CFile_: SetFileDateTime, Unable to convert System Time object to "
                                "File Time object. GetLastError returns 87"));
-    EXPECT_FALSE(file.SetFileDateTime("C:\\App\\Sub\\missing.dll"));
-    EXPECT_TRUE(trace.Contains("CFile_: SetFileDateTime, Unable to open 'C:\\App\\Sub\\missing.dll'. "
-                               "GetLastError returns 2"));
-}
-
-TEST_F(UpdateFile, InstallCommandsRunInTheHomeDirectory) {
-    machine.WriteFile("C:\\App\\Sub\\old.txt", "x");
-    CFile_ file = Make("[DEL] old.txt");
-    EXPECT_EQ(1, file.Apply());
-    EXPECT_FALSE(Exists("C:\\App\\Sub\\old.txt"));
-    EXPECT_TRUE(file.IsApplied());
-
-    // Blanks are a command text: it is run, and finds nothing to do.
-    CFile_ blanks = Make("   ");
-    ASSERT_TRUE(file.Rollback());
-    EXPECT_EQ(1, blanks.Apply());
-    EXPECT_TRUE(trace.Contains("CFile_: Command(s) found:    "));
 }
 
 // Result 4 leaves the new file in place, not applied; Rollback still puts the old one back.
-TEST_F(UpdateFile, FailingCommandsGiveFourAndRollbackRestoresTheTarget) {
+TEST_F(UpdateFile, CommandsRunInTheHomeDirectoryAndTheirFailureIsUndone) {
     machine.WriteFile(kTarget, "old");
     for (const char* command : {"[DEL] missing.txt", "[TRY-DEL] missing.txt"}) {
         SCOPED_TRACE(command);
@@ -228,18 +153,18 @@ TEST_F(UpdateFile, FailingCommandsGiveFourAndRollbackRestoresTheTarget) {
         EXPECT_EQ(4, file.Apply());
         EXPECT_EQ("new", Read(kTarget));
         EXPECT_FALSE(file.IsApplied());
-        EXPECT_EQ(std::string(command) == "[DEL] missing.txt",
-                  trace.Contains("CFile_: Command execution threw error"));
-        EXPECT_TRUE(trace.Contains("CFile_: return value is 4"));
-
+        EXPECT_EQ(command[1] == 'D', trace.Contains("CFile_: Command execution threw error"));
         EXPECT_FALSE(file.RemoveBackupFile());  // the only copy of "old"
-        EXPECT_EQ("old", Read(kBackup));
         EXPECT_TRUE(file.Rollback());
-        EXPECT_TRUE(trace.Contains(
-            "CFile_: file 'Dist\\a.dll' not applied, but its copy is in place, rolling back"));
         EXPECT_EQ("old", Read(kTarget));
         EXPECT_FALSE(Exists(kBackup));
     }
+
+    machine.WriteFile("C:\\App\\Sub\\old.txt", "x");
+    EXPECT_EQ(1, Make("[DEL] old.txt").Apply());
+    EXPECT_FALSE(Exists("C:\\App\\Sub\\old.txt"));
+    EXPECT_EQ(1, Make("   ").Apply());  // blanks are run, and find nothing to do
+    EXPECT_TRUE(trace.Contains("CFile_: Command(s) found:    "));
 }
 
 // A program holds the target open (it may be read, not replaced): the copy goes to the restart
@@ -251,7 +176,6 @@ TEST_F(UpdateFile, InUseTargetIsQueuedForRestartAndNotApplied) {
     ASSERT_TRUE(running.Open(kTarget, plat::CFile::modeRead | plat::CFile::shareDenyWrite));
     CFile_ file = Make("[DEL] marker.txt", "1/2/2004");
     EXPECT_EQ(0, file.Apply());
-    EXPECT_FALSE(file.IsApplied());
     EXPECT_EQ("old", Read(kTarget));
     EXPECT_TRUE(Exists("C:\\App\\Sub\\marker.txt"));
     EXPECT_TRUE(trace.Contains(
@@ -260,7 +184,6 @@ TEST_F(UpdateFile, InUseTargetIsQueuedForRestartAndNotApplied) {
     EXPECT_TRUE(trace.Contains(
         "CFile_: SetupInstallFileEx succeeded, but the file was in use.  It has been queued to be "
         "installed on the next system reboot."));
-
     std::vector<plat::setup::PendingRename> queue;
     ASSERT_TRUE(plat::setup::ReadPendingRenames(&queue));
     ASSERT_EQ(1u, queue.size());
@@ -291,18 +214,12 @@ TEST_F(UpdateFile, FailedRestoreNeverLosesThePreviousVersion) {
     EXPECT_FALSE(file.Rollback());
     plat::fault::Clear();
     EXPECT_FALSE(file.IsApplied());
-    EXPECT_EQ("new", Read(kTarget));
     EXPECT_TRUE(trace.Contains("CFile_: Rollback failed, retrying, error code is 32"));
 
     // The clean-up's RemoveBackupFile and a retried Apply both leave the backup alone.
     EXPECT_FALSE(file.RemoveBackupFile());
-    EXPECT_TRUE(trace.Contains("CFile_: RemoveBackupFile, keeping 'C:\\App\\Sub\\a.dll.$bak$': it "
-                               "holds the only copy of the previous version of 'Dist\\a.dll'"));
     EXPECT_EQ(1, file.Apply());
     EXPECT_EQ("old", Read(kBackup));
-    EXPECT_TRUE(trace.Contains("CFile_: Backup not taken, the target is this file's earlier copy; "
-                               "its previous version stays in 'C:\\App\\Sub\\a.dll.$bak$'"));
-
     EXPECT_TRUE(file.Rollback());
     EXPECT_EQ("old", Read(kTarget));
     EXPECT_FALSE(Exists(kBackup));
@@ -314,7 +231,6 @@ TEST_F(UpdateFile, FailedDeletionOfANewTargetIsRetriedByTheNextRollback) {
     plat::fault::FailNth(plat::fault::Op::Remove, 1, plat::kErrorSharingViolation);
     EXPECT_FALSE(file.Rollback());
     plat::fault::Clear();
-    EXPECT_TRUE(Exists(kTarget));
     EXPECT_TRUE(file.Rollback());
     EXPECT_FALSE(Exists(kTarget));
 }
