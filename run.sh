@@ -2,6 +2,7 @@
 # Mendler's two set-up commands:
 #   ./run.sh test   install what is missing, build, run every test
 #   ./run.sh demo   install what is missing, build, update the products of the demo machine
+#   ./run.sh fuzz [SECONDS]   build the fuzz targets with clang and run each for SECONDS (not in CI)
 # Both are idempotent and quick when nothing changed.
 set -euo pipefail
 cd "$(dirname "$0")"
@@ -39,5 +40,6 @@ cmd_demo() {
 case "${1:-}" in
   test) cmd_test ;;
   demo) cmd_demo ;;
-  *) echo "usage: ./run.sh test | demo" >&2; exit 2 ;;
+  fuzz) shift; bash fuzz/run.sh "$@" ;;
+  *) echo "usage: ./run.sh test | demo | fuzz [SECONDS]" >&2; exit 2 ;;
 esac
