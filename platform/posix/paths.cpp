@@ -211,7 +211,12 @@ std::string FullPath(const std::string& winPath) {
         std::vector<std::string> c = SplitComponents(p);
         if (c.size() < 2) return p;
         const std::string prefix = "\\\\" + c[0] + "\\" + c[1];
-        return Fold(prefix, p.substr(prefix.size()), trailing);
+        // The rest starts where the share's name ends in p; doubled separators before it make
+        // p longer than the prefix, so the prefix's length is no position in p.
+        const std::size_t server = p.find_first_not_of('\\');
+        const std::size_t share = p.find_first_not_of('\\', p.find('\\', server));
+        const std::size_t rest = std::min(p.find('\\', share), p.size());
+        return Fold(prefix, p.substr(rest), trailing);
     }
     if (HasDrive(p)) {
         const std::string drive(1, static_cast<char>(std::toupper(static_cast<unsigned char>(p[0]))));

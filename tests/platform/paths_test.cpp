@@ -134,6 +134,16 @@ TEST(CurrentDirectory, ResolvesRelativePathsAndDrivesTheCurrentDrive) {
     EXPECT_EQ(FullPath("C:sub"), "C:\\sub");
 }
 
+// Found by fuzzing: doubled separators around the server name shifted the rest of the path.
+TEST(FullPath, UncPathsKeepTheirComponentsWhateverTheSeparators) {
+    pextest::TestMachine m;
+    using plat::paths::FullPath;
+    EXPECT_EQ(FullPath("\\\\server\\share\\x"), "\\\\server\\share\\x");
+    EXPECT_EQ(FullPath("\\\\server\\\\share\\x\\"), "\\\\server\\share\\x\\");
+    EXPECT_EQ(FullPath("\\\\\\a\\b"), "\\\\a\\b\\");
+    EXPECT_EQ(FullPath("//a//b/../c"), "\\\\a\\b\\c");
+}
+
 TEST(CurrentDirectory, RefusesMissingFoldersAndRestartsWithANewMachine) {
     pextest::TestMachine m;
     ASSERT_TRUE(plat::paths::ChangeDirectory("C:\\windows"));
