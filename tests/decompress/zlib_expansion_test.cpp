@@ -134,6 +134,28 @@ TEST_F(ZlibExpansion, CorruptOrTruncatedDataFailsAndTheDownloadIsPutBack) {
     EXPECT_TRUE(trace_.Contains("CDecompressionObjects::DecompressZLib, zlib reports: the data ends before the end of the stream"));
 }
 
+// Damage anywhere in a stream: either the damage is in a field that nothing checks (the gzip
+// header's time or system) and the data comes out whole, or the expansion fails and the download
+// is put back; never anything in between.
+TEST_F(ZlibExpansion, DamagedStreamsNeverGiveWrongData) {
+    const std::string original = Sample(5000);
+    for (int format : {kZlibFormat, kGzipFormat}) {
+        const std::string good = Deflate(original, format);
+        std::uint32_t x = 99;
+        for (int round = 0; round < 60; ++round) {
+            std::string damaged = good;
+            for (int hits = 0; hits < 1 + round % 3; ++hits) {
+                x = x * 1103515245u + 12345u;
+                damaged[(x >> 8) % damaged.size()] ^= static_cast<char>(1 + (x >> 24) % 255);
+            }
+            if (round % 5 == 0) damaged.resize((x >> 4) % damaged.size());
+            SCOPED_TRACE(round);
+            const bool expanded = Expand(damaged);
+            EXPECT_EQ(machine_.ReadFile(kPath), expanded ? original : damaged);
+        }
+    }
+}
+
 // A full disk while the expanded data is written: the download is put back all the same.
 bool FailTheNextWrite(CProgressData*) {
     static bool armed = false;  // only once: the ending report's call comes before the trace lines
