@@ -9,6 +9,7 @@
 #include "entry/mendler_api.h"
 #include "entry/progress_data.h"
 #include "manifest/content_table.h"
+#include "model/master_list.h"
 #include "platform/bstr.h"
 
 class MENDLER_API CManifestParser {
@@ -49,11 +50,18 @@ public:
     bool DiscardContentFile();
 
     // --- analysis ---
+    // Admits the current row (row index rowNumber) into the master list when it takes part.
+    void AnalyzeRow(std::int32_t rowNumber, ProgressCallback callback);
     std::uint32_t DetermineDownloadtype(const std::string& parties);
     static std::string sGetInterestedPartiesInformation(const std::string& component);
     static std::uint32_t ConvertCompressionType(const std::string& name);
     static std::uint32_t PickBest(std::uint32_t last, const std::set<std::uint32_t>& supported);
     static std::uint32_t NextWorst(std::uint32_t type);
+
+    // --- apply pipeline ---
+    // Decompresses, applies the groups in dependency order and cleans up; returns the final
+    // failure count, which it also leaves in result.
+    std::int32_t iProcessUpdateInformation(std::int32_t& result, ProgressCallback callback);
 
     // Read access for tests and tools.
     const CContentTable& Table() const { return table_; }
@@ -68,10 +76,16 @@ public:
     bool MandatoryOnly() const { return mandatoryOnly_; }
     const std::string& ContentFilePath() const { return contentFilePath_; }
     const std::string& ContentFileTarget() const { return contentFileTarget_; }
+    const CMasterList& MasterList() const { return masterList_; }
 
 private:
     // Records whether the normalised name is in the special-file list.
     void TestSpecialFile(const std::string& fileName);
+    // Pipeline steps.
+    void DecompressFiles(std::int32_t& result, ProgressCallback callback);
+    void ApplyGroups(std::int32_t& result, ProgressCallback callback);
+    void ApplyGroup(CFileGroup& group, std::int32_t& result, ProgressCallback callback);
+    void CleanUp(std::int32_t result, ProgressCallback callback);
 
     std::set<std::string> specialFiles_;
     bool specialFileAttempted_ = false;
@@ -88,4 +102,7 @@ private:
     std::string contentFilePath_;
     bool mandatoryOnly_ = false;
     std::string contentFileTarget_;
+
+    CMasterList masterList_;
+    std::uint32_t workSteps_ = 0;
 };

@@ -37,6 +37,9 @@ public:
     // Expands the downloaded copy in place through the process-wide decompressor, created on
     // first use. True when the copy is ready; then no further decompression is needed.
     bool Decompress(ProgressCallback callback);
+    // Unloads the decompression library that Decompress loaded, if any (after each
+    // decompression step of a run).
+    static void UnloadDecompressor();
 
     // path + ".$bak$", with "x" appended until no file or folder has that name.
     std::string MakeBackupFileName(std::string path) const;

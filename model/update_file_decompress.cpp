@@ -35,3 +35,8 @@ bool CFile_::Decompress(ProgressCallback callback) {
     TRACE(g_TraceLog, "CFile_::Decompress return value is %d", decompressed);
     return decompressed;
 }
+
+void CFile_::UnloadDecompressor() {
+    // Without a decompressor no file has loaded the library, so there is nothing to unload.
+    if (std::unique_ptr<CDecompressionObjects>& decompressor = SharedDecompressor()) decompressor->Unload();
+}

@@ -1,0 +1,179 @@
+// CManifestParser: the apply pipeline: decompression, group application in dependency order with
+// bounded retries and group rollback, status recording in the content file, and cleanup.
+#include <vector>
+
+#include "diag/trace_log.h"
+#include "manifest/manifest_parser.h"
+#include "model/upgrade_status.h"
+
+namespace {
+
+void Report(ProgressCallback callback, const std::string& status) {
+    if (!callback) return;
+    g_ProgressData.SetStatusText(status);
+    callback(&g_ProgressData);
+}
+
+void Step(ProgressCallback callback) {
+    if (!callback) return;
+    g_ProgressData.IncrementCurrentStep();
+    callback(&g_ProgressData);
+}
+
+}  // namespace
+
+std::int32_t CManifestParser::iProcessUpdateInformation(std::int32_t& result, ProgressCallback callback) {
+    TRACE(g_TraceLog, "CManifestParser: iProcessUpdateInformation");
+    DecompressFiles(result, callback);
+    ApplyGroups(result, callback);
+    CleanUp(result, callback);
+    TRACE(g_TraceLog, "CManifestParser: ProcessUpdateInformation, returning %d", result);
+    return result;
+}
+
+void CManifestParser::DecompressFiles(std::int32_t& result, ProgressCallback callback) {
+    TRACE(g_TraceLog, "%s", "");
+    TRACE(g_TraceLog, "CManifestParser:  Decompression step.....");
+    TRACE(g_TraceLog, "%s", "");
+    Report(callback, "Decompressing...");
+    for (auto& [key, group] : masterList_) {
+        TRACE(g_TraceLog, "%s", "");
+        TRACE(g_TraceLog, "CManifestParser: Examining group '%s' for files needing decompressing...", key.c_str());
+        for (CFile_& file : group.GetFiles()) {
+            TRACE(g_TraceLog, "CManifestParser: Examining file '%s' to see if it needs decompressing ( %d, %d, %d )",
+                  file.GetFileName().c_str(), mandatoryOnly_ ? 1 : 0, file.IsMandatory() ? 1 : 0,
+                  file.IsDecompressionNeeded() ? 1 : 0);
+            if ((mandatoryOnly_ && !file.IsMandatory()) || !file.IsDecompressionNeeded()) continue;
+            Report(callback, "Decompressing " + file.GetFileName());
+            if (file.Decompress(callback)) {
+                SetField(static_cast<std::int32_t>(file.GetRow()), "NeedsDecompression", "0");
+                WriteManifest();
+            } else {
+                ++result;
+            }
+            Step(callback);
+        }
+    }
+    WriteManifest();
+    CFile_::UnloadDecompressor();
+    Report(callback, "Applying...");
+}
+
+void CManifestParser::ApplyGroups(std::int32_t& result, ProgressCallback callback) {
+    for (bool anotherPass = true; anotherPass;) {
+        TRACE(g_TraceLog, "%s", "");
+        TRACE(g_TraceLog, "CManifestParser:  Application loop.....");
+        TRACE(g_TraceLog, "%s", "");
+        anotherPass = false;
+        for (auto it = masterList_.begin(); it != masterList_.end(); ++it) {
+            CFileGroup& group = it->second;
+            const char* name = it->first.c_str();
+            TRACE(g_TraceLog, "%s", "");
+            TRACE(g_TraceLog, "CManifestParser: Applying group '%s'...", name);
+            if (!group.IsGroupDecompressed()) {
+                TRACE(g_TraceLog, "CManifestParser: group is not decompressed, application of this group will not occur");
+                continue;
+            }
+            if (group.IsGroupApplied()) {
+                TRACE(g_TraceLog, "CManifestParser: group '%s' applied already", name);
+                continue;
+            }
+            TRACE(g_TraceLog, "CManifestParser: group is not applied");
+            TRACE(g_TraceLog, "CManifestParser: Items dependant: %d", static_cast<int>(group.GetDependancies().size()));
+            for (const std::string& dependancy : group.GetDependancies()) TRACE(g_TraceLog, "\t%s", dependancy.c_str());
+            TRACE(g_TraceLog, "%s", "");
+            if (masterList_.DependedOnItemsApplied(it)) {
+                ApplyGroup(group, result, callback);
+                continue;
+            }
+            TRACE(g_TraceLog, "CManifestParser: group '%s' reports dependancy not applied, moving on", name);
+            if (group.GetRetries() > masterList_.GetFilesAdded() - 1) {
+                TRACE(g_TraceLog, "retry threshold exceeded, giving up on '%s'", name);
+            } else {
+                TRACE(g_TraceLog, "allowing retry...");
+                anotherPass = true;
+                group.IncrementRetries();
+            }
+        }
+    }
+    TRACE(g_TraceLog, "Application loop complete...");
+    TRACE(g_TraceLog, "---------------------------------------------------");
+    TRACE(g_TraceLog, "After application, the manifest contents are:\r\n%s", table_.ToText().c_str());
+}
+
+void CManifestParser::ApplyGroup(CFileGroup& group, std::int32_t& result, ProgressCallback callback) {
+    TRACE(g_TraceLog, "CManifestParser: Dependancies are applied");
+    bool groupError = false;
+    std::vector<std::uint32_t> appliedRows;  // rows marked applied by this attempt
+    for (CFile_& file : group.GetFiles()) {
+        const std::string fileName = file.GetFileName();
+        const auto row = static_cast<std::int32_t>(file.GetRow());
+        TRACE(g_TraceLog, "CManifestParser: considering applying file '%s'", fileName.c_str());
+        if (mandatoryOnly_ && !file.IsMandatory()) {
+            TRACE(g_TraceLog, "CManifestParser: not applying file, not part of this package");
+            continue;
+        }
+        if (file.IsApplied()) {
+            TRACE(g_TraceLog, "CManifestParser: file already applied");
+            continue;
+        }
+        TRACE(g_TraceLog, "CManifestParser: file not applied yet");
+        if (!file.IsDownloaded()) {
+            TRACE(g_TraceLog, "CManifestParser: File isn't downloaded properly, not applying");
+            continue;
+        }
+        Report(callback, "Applying " + fileName);
+        const std::int32_t applied = file.Apply();
+        if (applied == CFile_::kApplied) {
+            TRACE(g_TraceLog, "CManifestParser: file '%s' applied", fileName.c_str());
+            SetField(row, "UpgradeStatus", UpgradeStatus[kAppliedSuccessfully]);
+            appliedRows.push_back(file.GetRow());
+            Step(callback);
+            continue;
+        }
+        if (applied == CFile_::kCommandsFailed)
+            TRACE(g_TraceLog, "CManifestParser: error running install commands for ( '%s' )", fileName.c_str());
+        else
+            TRACE(g_TraceLog, "CManifestParser: file '%s' not applied", fileName.c_str());
+        SetField(row, "UpgradeStatus", UpgradeStatus[kApplicationFailed]);
+        ++result;
+        groupError = true;
+        break;
+    }
+    if (groupError) {
+        TRACE(g_TraceLog, "CManifestParser: Error detected applying a member of a file group, rolling back group.");
+        for (CFile_& file : group.GetFiles()) {
+            TRACE(g_TraceLog, "CManifestParser: attempting roll back of '%s'", file.GetFileName().c_str());
+            file.Rollback();
+        }
+        // The members that were in place are undone with the group: the next run must install
+        // them again, so they must not read as applied.
+        for (std::uint32_t row : appliedRows)
+            SetField(static_cast<std::int32_t>(row), "UpgradeStatus", UpgradeStatus[kDownloaded]);
+    }
+    WriteManifest();
+    TRACE(g_TraceLog, "CManifestParser: b.o.l., Manifest written");
+}
+
+void CManifestParser::CleanUp(std::int32_t result, ProgressCallback callback) {
+    if (result == 0) {
+        Report(callback, "Cleaning up");
+        TRACE(g_TraceLog,
+              "CManifestParser: ProcessUpdateInformation, success, deleting content file '%s', removing reg key "
+              "entry, removing backup files, removing temp files.",
+              contentFilePath_.c_str());
+        DiscardContentFile();
+        Step(callback);
+    } else {
+        TRACE(g_TraceLog, "CManifestParser: ProcessUpdateInformation,  not a complete success, performing needed cleanup");
+        WriteManifest();
+    }
+    for (auto& [key, group] : masterList_) {
+        for (CFile_& file : group.GetFiles()) {
+            TRACE(g_TraceLog, "CManifestParser: ProcessUpdateInformation, removing backup file for '%s'",
+                  file.GetFileName().c_str());
+            file.RemoveBackupFile();
+            if (file.IsApplied()) file.Remove();
+        }
+    }
+}
