@@ -7,10 +7,9 @@
 if(TARGET pex_decompress AND TARGET Rivzip)
   pex_add_test(decompress_test
     SOURCES
-      ${CMAKE_CURRENT_SOURCE_DIR}/decompress/decompression_objects_test.cpp
+      ${CMAKE_CURRENT_SOURCE_DIR}/decompress/in_place_expansion_test.cpp
       ${CMAKE_CURRENT_SOURCE_DIR}/decompress/library_location_test.cpp
       ${CMAKE_CURRENT_SOURCE_DIR}/decompress/expand_progress_test.cpp
-      ${CMAKE_CURRENT_SOURCE_DIR}/decompress/zlib_expansion_test.cpp
     LIBS pex_decompress rivzip_codec)
   set_target_properties(decompress_test PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${CMAKE_CURRENT_BINARY_DIR}/decompress)
   # PexNoVersion (tests/platform_system.cmake) stands for a library without the expand entry.

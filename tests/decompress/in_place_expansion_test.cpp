@@ -1,0 +1,174 @@
+// The dispatcher by compression code, and downloads expanded in place: SZDD through Rivzip.dll,
+// zlib and gzip through zlib; a download that cannot be expanded stays as it arrived.
+#include <zlib.h>
+
+#include "platform/cfile.h"
+#include "platform/errors.h"
+#include "platform/fault.h"
+#include "platform/files.h"
+#include "rivzip/file_operations.h"
+#include "tests/decompress/decompress_test_support.h"
+
+namespace dectest {
+namespace {
+
+constexpr char kPath[] = "C:\\dl\\app.exe";
+
+std::string Sample(std::size_t size) {
+    std::string data(size, '\0');
+    std::uint32_t x = 12345;
+    for (char& c : data) c = "abcdefgh"[((x = x * 1103515245u + 12345u) >> 16) & 7];
+    return data;
+}
+
+std::string Deflate(const std::string& data, int windowBits) {
+    z_stream z{};
+    deflateInit2(&z, Z_BEST_SPEED, Z_DEFLATED, windowBits, 8, Z_DEFAULT_STRATEGY);
+    std::string out(deflateBound(&z, data.size()), '\0');
+    z.next_in = reinterpret_cast<Bytef*>(const_cast<char*>(data.data()));
+    z.avail_in = static_cast<uInt>(data.size());
+    z.next_out = reinterpret_cast<Bytef*>(out.data());
+    z.avail_out = static_cast<uInt>(out.size());
+    deflate(&z, Z_FINISH);
+    out.resize(z.total_out);
+    deflateEnd(&z);
+    return out;
+}
+constexpr int kZlib = 15, kGzip = 15 + 16;
+
+CProgressData lastReport;
+bool Note(CProgressData* progress) {
+    lastReport = *progress;
+    return true;
+}
+
+class InPlaceExpansion : public DecompressTest {
+protected:
+    void SetUp() override {
+        Place(kRivzipModule, "C:\\Rivzip.dll");
+        dispatcher_.Load();
+    }
+    void TearDown() override {
+        plat::fault::Clear();
+        DecompressTest::TearDown();
+    }
+
+    bool Expand(std::uint32_t code, const std::string& download, ProgressCallback callback = nullptr) {
+        machine_.WriteFile(kPath, download);
+        trace_.Clear();
+        return dispatcher_.Decompress(code, kPath, callback);
+    }
+    std::string Szdd(const std::string& text) {
+        machine_.WriteFile("C:\\original", text);
+        plat::CFile source, destination;
+        source.Open("C:\\original", plat::CFile::modeRead);
+        destination.Open("C:\\packed", plat::CFile::modeCreate | plat::CFile::modeWrite);
+        rivzip::CompressFile(source, destination, nullptr);
+        destination.Close();
+        return machine_.ReadFile("C:\\packed");
+    }
+    // The name that sGetTempFileName gave, from its trace line.
+    std::string TempName() const {
+        const std::string prefix = "CManifestParser: sGetTempFileName, return is '";
+        for (const std::string& line : trace_.Lines())
+            if (line.rfind(prefix, 0) == 0) return line.substr(prefix.size(), line.size() - prefix.size() - 1);
+        return std::string();
+    }
+
+    CDecompressionObjects dispatcher_;
+};
+
+TEST_F(InPlaceExpansion, CodesWithoutExpansion) {
+    EXPECT_TRUE(Expand(kCompressionNone, "payload"));
+    EXPECT_EQ(trace_.Lines()[1], "CDecompressionObjects::DecompressNone, file is C:\\dl\\app.exe");
+    EXPECT_FALSE(Expand(kCompressionRTPatch, "payload")) << "a patch is never the file itself";
+    EXPECT_EQ(trace_.Lines(), (Lines{"CDecompressionObjects::Decompress, file is C:\\dl\\app.exe",
+                                     "CDecompressionObjects::DecompressRTPatch, file is C:\\dl\\app.exe THIS FUNCTION NOT IMPLEMENTED YET",
+                                     "CDecompressionObjects::Decompress, returning 0"}));
+    EXPECT_FALSE(Expand(7, "payload"));
+    EXPECT_EQ(trace_.Lines()[1], "CDecompressionObjects::Decompress, Unknown compression type 7");
+    EXPECT_EQ(machine_.ReadFile(kPath), "payload");
+}
+
+TEST_F(InPlaceExpansion, LzwThroughTheLibrary) {
+    const std::string original = Sample(3 << 20);
+    EXPECT_TRUE(Expand(kCompressionLZW, Szdd(original), &Note));
+    EXPECT_EQ(machine_.ReadFile(kPath), original);
+    const std::string temp = TempName(), p = "CDecompressionObjects::DecompressLZW, ";
+    EXPECT_EQ(trace_.Lines(), (Lines{"CDecompressionObjects::Decompress, file is C:\\dl\\app.exe",
+                                     p + "file is C:\\dl\\app.exe", "CManifestParser: sGetTempFileName",
+                                     "CManifestParser: sGetTempFileName, return is '" + temp + "'",
+                                     p + "rename from 'C:\\dl\\app.exe' to '" + temp + "' successfull",
+                                     p + "open of '" + temp + "' successfull",
+                                     p + "open of 'C:\\dl\\app.exe' successfull", p + "Decompress succeeded",
+                                     p + "returning 1", "CDecompressionObjects::Decompress, returning 1"}));
+    EXPECT_FALSE(plat::files::Exists(temp));
+    EXPECT_EQ(lastReport.ItemDone, static_cast<std::int32_t>(original.size() >> 3));
+}
+
+TEST_F(InPlaceExpansion, ZlibAndGzipStreams) {
+    const std::string original = Sample(300000);
+    for (int format : {kZlib, kGzip}) {
+        const std::string packed = Deflate(original, format);
+        EXPECT_TRUE(Expand(kCompressionZLIB, packed, &Note));
+        EXPECT_EQ(machine_.ReadFile(kPath), original);
+        EXPECT_EQ(lastReport.ItemDone, static_cast<std::int32_t>(packed.size() >> 3)) << "counted in compressed bytes";
+    }
+    EXPECT_TRUE(trace_.Contains("CDecompressionObjects::DecompressZLib, Decompress succeeded"));
+    EXPECT_TRUE(Expand(kCompressionZLIB, Deflate("one, ", kGzip) + Deflate("two", kGzip)));
+    EXPECT_EQ(machine_.ReadFile(kPath), "one, two");
+    EXPECT_TRUE(Expand(kCompressionZLIB, Deflate("", kZlib)));
+    EXPECT_EQ(machine_.ReadFile(kPath), "");
+}
+
+TEST_F(InPlaceExpansion, AFailedExpansionPutsTheDownloadBack) {
+    const std::string szdd = Szdd(Sample(200000)), zlib = Deflate(Sample(100000), kZlib);
+    std::string flipped = zlib;
+    flipped[zlib.size() / 2] ^= 0x55;
+    const struct { std::uint32_t code; std::string download; const char* result; } cases[] = {
+        {kCompressionLZW, szdd.substr(0, szdd.size() / 2), "0xfffffffe."},
+        {kCompressionLZW, "MZ not compressed", "0xffffffff."},
+        {kCompressionZLIB, "", "0xfffffffb."},
+        {kCompressionZLIB, zlib.substr(0, zlib.size() / 2), "0xfffffffb."},
+        {kCompressionZLIB, flipped, "0xfffffffd."},
+        {kCompressionZLIB, zlib + std::string(4, '\0'), "0xfffffffd."},
+        {kCompressionZLIB, "MZ not compressed", "0xfffffffd."},
+    };
+    for (const auto& c : cases) {
+        EXPECT_FALSE(Expand(c.code, c.download));
+        EXPECT_EQ(machine_.ReadFile(kPath), c.download);
+        const std::string p = c.code == kCompressionLZW ? "CDecompressionObjects::DecompressLZW, "
+                                                        : "CDecompressionObjects::DecompressZLib, ";
+        EXPECT_TRUE(trace_.Contains(p + "Decompress failed, return code is " + c.result));
+        EXPECT_TRUE(trace_.Contains(p + "restored the compressed file 'C:\\dl\\app.exe' from '" + TempName() + "'"));
+        EXPECT_FALSE(plat::files::Exists(TempName()));
+    }
+    EXPECT_TRUE(trace_.Contains("CDecompressionObjects::DecompressZLib, zlib reports: incorrect header check"))
+        << "the last case's reason";
+
+    // When the copy back fails too, the compressed copy is kept and named.
+    plat::fault::FailNth(plat::fault::Op::Copy, 2, plat::kErrorAccessDenied);
+    EXPECT_FALSE(Expand(kCompressionZLIB, flipped));
+    const std::string temp = TempName();
+    EXPECT_TRUE(trace_.Contains("CDecompressionObjects::DecompressZLib, Unable to restore the compressed file "
+                                "'C:\\dl\\app.exe' from '" + temp + "', GetLastError returns 5, '" + temp + "' is kept"));
+    EXPECT_EQ(machine_.ReadFile(temp), flipped);
+}
+
+// Damage anywhere in a stream either hits a field that nothing checks (the gzip header's time or
+// system) and the data comes out whole, or the download stays as it arrived; nothing between.
+TEST_F(InPlaceExpansion, DamagedStreamsNeverGiveWrongData) {
+    const std::string original = Sample(5000);
+    std::uint32_t x = 99;
+    for (int round = 0; round < 120; ++round) {
+        std::string damaged = Deflate(original, round % 2 ? kGzip : kZlib);
+        for (int hits = 0; hits <= round % 3; ++hits, x = x * 1103515245u + 12345u)
+            damaged[(x >> 8) % damaged.size()] ^= static_cast<char>(1 + (x >> 24) % 255);
+        if (round % 5 == 0) damaged.resize((x >> 4) % damaged.size());
+        const bool expanded = Expand(kCompressionZLIB, damaged);
+        EXPECT_EQ(machine_.ReadFile(kPath), expanded ? original : damaged) << "round " << round;
+    }
+}
+
+}  // namespace
+}  // namespace dectest
