@@ -89,6 +89,10 @@ void CManifestParser::ApplyGroups(std::int32_t& result, ProgressCallback callbac
             TRACE(g_TraceLog, "CManifestParser: group '%s' reports dependancy not applied, moving on", name);
             if (group.GetRetries() > masterList_.GetFilesAdded() - 1) {
                 TRACE(g_TraceLog, "retry threshold exceeded, giving up on '%s'", name);
+                // A group left out is not a success: counting it keeps the content file, so its
+                // rows are offered again by the next run instead of being discarded unapplied.
+                ++result;
+                TRACE(g_TraceLog, "CManifestParser: group '%s' not applied in this run, counted as a failure", name);
             } else {
                 TRACE(g_TraceLog, "allowing retry...");
                 anotherPass = true;

@@ -1,0 +1,93 @@
+#include "tests/pipeline/pipeline_fixture.h"
+
+#include <algorithm>
+
+#include "platform/files.h"
+#include "tests/support/test_registry.h"
+
+namespace reg = plat::reg;
+
+namespace pextest {
+
+namespace {
+
+const std::vector<std::string> kColumns = {
+    "FileName",  "UpgradeStatus",   "HomeDir",           "DynamicFieldInfo", "Force Download",
+    "Snoozable", "InterestedParties", "DownLoadCacheFile", "FileGroup",        "DependancyOrder",
+    "NeedsDecompression", "Command", "UpdateDate"};
+
+std::string Join(const std::vector<std::string>& cells) {
+    std::string line;
+    for (size_t i = 0; i < cells.size(); ++i) line += (i ? "," : "") + cells[i];
+    return line + "\r\n";
+}
+
+}  // namespace
+
+void PipelineTest::Publish(const std::vector<ContentRow>& rows, const std::string& mode) {
+    const std::string section = std::string("Software\\Vantric\\Pex\\") + kProduct;
+    SetRegText(reg::kLocalMachine, section, "ContentFileName", kContent);
+    SetRegText(reg::kLocalMachine, section, "ContentFileMode", mode);
+    SetRegText(reg::kLocalMachine, section, "ContentFileTarget", "");
+    std::string text = Join(kColumns);
+    for (const ContentRow& row : rows) {
+        std::vector<std::string> cells;
+        for (const std::string& column : kColumns) {
+            auto it = row.find(column);
+            cells.push_back(it == row.end() ? "" : it->second);
+        }
+        text += Join(cells);
+    }
+    machine.WriteFile(kContent, text);
+}
+
+std::string PipelineTest::Download(const std::string& name, const std::string& bytes) {
+    const std::string path = "C:\\Pex\\cache\\" + name;
+    machine.WriteFile(path, bytes);
+    return path;
+}
+
+ContentRow PipelineTest::Row(const std::string& fileName, const std::string& bytes, const std::string& group,
+                             const std::string& dependancies) {
+    return {{"FileName", fileName},
+            {"UpgradeStatus", "Downloaded"},
+            {"HomeDir", kHome},
+            {"InterestedParties", "Nobody"},  // no capabilities: LZW, harmless without decompression
+            {"DownLoadCacheFile", Download(fileName + ".new", bytes)},
+            {"FileGroup", group},
+            {"DependancyOrder", dependancies},
+            {"NeedsDecompression", "0"}};
+}
+
+CContentTable PipelineTest::Content() const {
+    CContentTable table;
+    table.LoadFromText(machine.ReadFile(kContent));
+    return table;
+}
+
+std::string PipelineTest::Cell(std::uint32_t row, const std::string& column) const {
+    const CContentTable table = Content();
+    const int index = table.ColumnIndex(column);
+    return index < 0 ? std::string() : table.Cell(row, static_cast<std::uint32_t>(index));
+}
+
+bool PipelineTest::ContentEntriesPresent() const {
+    const std::string section = std::string("Software\\Vantric\\Pex\\") + kProduct;
+    std::string bytes;
+    return GetRegValue(reg::kLocalMachine, section, "ContentFileName", &bytes) ||
+           GetRegValue(reg::kLocalMachine, section, "ContentFileMode", &bytes) ||
+           GetRegValue(reg::kLocalMachine, section, "ContentFileTarget", &bytes);
+}
+
+std::string PipelineTest::Installed(const std::string& fileName) const {
+    return machine.ReadFile(std::string(kHome) + "\\" + fileName);
+}
+
+bool PipelineTest::ExistsOnMachine(const std::string& winPath) const { return plat::files::Exists(winPath); }
+
+int PipelineTest::Count(const std::string& line) const {
+    const auto lines = trace.Lines();
+    return static_cast<int>(std::count(lines.begin(), lines.end(), line));
+}
+
+}  // namespace pextest
