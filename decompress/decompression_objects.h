@@ -60,8 +60,9 @@ public:
     std::string GetDLL();
 
     // The progress function handed to the library: forwards a thinned-out selection of the
-    // reports (every start, the first report after it and every 2500th, every end) to the
-    // stored callback through g_ProgressData, amounts shifted right by 3.
+    // reports to the stored callback through g_ProgressData, amounts shifted right by 3. A
+    // starting report gives two calls (item total, then item done); counted from it, every
+    // 2500th report gives one; an ending report gives one, with the total as the amount done.
     static void ExpandProgress(SCompressPerformance& performance);
     // Stores the callback that ExpandProgress reports to (null: none). DecompressLZW and
     // DecompressZLib store theirs.
