@@ -117,7 +117,9 @@ Lookup FirstResourceOfType(const std::string& bytes, std::uint32_t type, std::st
     if (!im.Ok(entry, 16)) return Lookup::NotFound;
     std::uint32_t size = im.U32(entry + 4);
     std::size_t offset;
-    if (!MapRva(sections, im.U32(entry), &offset, &avail) || size > avail) return Lookup::NotFound;
+    // The section table's sizes are only claims: a file cut short ends before its sections do.
+    if (!MapRva(sections, im.U32(entry), &offset, &avail) || size > avail || !im.Ok(offset, size))
+        return Lookup::NotFound;
     *data = bytes.substr(offset, size);
     return Lookup::Found;
 }

@@ -9,6 +9,7 @@
 #include "platform/errors.h"
 #include "platform/files.h"
 #include "platform/paths.h"
+#include "platform/pe_resources.h"
 #include "tests/support/test_machine.h"
 
 namespace {
@@ -111,6 +112,26 @@ TEST(VersionInfo, DamagedBlocksAreRejectedNotRead) {
         std::string cut;
         plat::ver::ReadBlock("C:\\cut.dll", &cut);
     }
+}
+
+// Found by fuzzing: a resource whose section lies partly beyond the end of the file threw
+// std::out_of_range, or came back cut short. Cut anywhere, the module gives its whole block or
+// none.
+TEST(VersionInfo, ModulesCutShortGiveTheWholeBlockOrNone) {
+    pextest::TestMachine m;
+    std::string file;
+    ASSERT_TRUE(plat::files::ReadAll(Fixture(), &file));
+    std::string whole;
+    ASSERT_EQ(plat::pe::FirstResourceOfType(file, plat::pe::kRtVersion, &whole), plat::pe::Lookup::Found);
+    std::size_t found = 0;
+    for (std::size_t n = 0; n < file.size(); ++n) {
+        std::string block;
+        const plat::pe::Lookup lookup = plat::pe::FirstResourceOfType(file.substr(0, n), plat::pe::kRtVersion, &block);
+        if (lookup != plat::pe::Lookup::Found) continue;
+        ++found;
+        EXPECT_EQ(block, whole) << "cut at " << n;
+    }
+    EXPECT_GT(found, 0u);  // the zero padding after the block may go
 }
 
 }  // namespace
