@@ -55,6 +55,15 @@ write("szdd_expander", "roundtrip", b"\x07" + b"abcabcabcabc hello hello hello "
 write("szdd_expander", "header_only", b"\x00" + b"SZDD\x88\xf0\x27\x33Ax\x10\x00\x00\x00")
 
 
+# --- zlib: first byte bit 0 = round trip (bit 1 gzip, bits 2-7 level) ---
+import gzip  # noqa: E402
+import zlib  # noqa: E402
+TEXT = b"Vantric update file contents, Vantric update file contents.\r\n" * 8
+write("zlib_expand", "zlib_stream", b"\x00" + zlib.compress(TEXT, 9))
+write("zlib_expand", "gzip_two_members", b"\x00" + gzip.compress(b"first ", mtime=0) + gzip.compress(b"second", mtime=0))
+write("zlib_expand", "stored_truncated", b"\x00" + zlib.compress(TEXT, 0)[:100])
+write("zlib_expand", "roundtrip_gzip", b"\x1b" + TEXT[:64])
+
 # --- version information ---
 def node(key, value=b"", text=False, children=()):
     """One VS_VERSIONINFO node, padded to 32 bits (nodes start aligned)."""
