@@ -1,27 +1,78 @@
-// `pexupdate script "TEXT"`: for people who write content files. Parses and checks a
-// dynamic-field text the way the updater does for a row's "DynamicFieldInfo" column, and shows
-// what it means and why it would be refused.
+// `pexupdate script "TEXT" [--row CONTENTFILE:N]`: for people who write content files. Parses and
+// checks a dynamic-field text the way the updater does for a row's "DynamicFieldInfo" column,
+// shows what it means and why it would be refused, and can try it on a row of a content file.
 #include <cstdio>
+#include <cstdlib>
 #include <string>
 #include <vector>
 
+#include "commands/update_services.h"
 #include "expr/execution_plan.h"
 #include "expr/expression_text.h"
+#include "manifest/content_table.h"
+#include "platform/paths.h"
 #include "tools/command.h"
 
 namespace {
 
 const char kUsage[] =
-    "usage: pexupdate script \"TEXT\"\n\n"
+    "usage: pexupdate script \"TEXT\" [--row CONTENTFILE:N]\n\n"
     "Parses TEXT as the dynamic-field script of a content-file row (the \"DynamicFieldInfo\"\n"
     "column, after the row's &#x2C; escapes are decoded), checks it against the language's\n"
     "names and types, and prints each assignment of the plan and every validation comment.\n"
     "A text that does not parse gets the parser's own message (\"syntax error\") first.\n"
-    "Exit status: 0 when the text is valid, 1 when it does not parse or is not valid.\n";
+    "With --row, a valid plan is also executed against row N (counted from 0, as the trace log\n"
+    "counts rows) of the content file, and the cells it changed are printed; the file itself is\n"
+    "not changed. CONTENTFILE is a Windows path on the machine, or a host path starting with '/'.\n"
+    "Exit status: 0 when the text is valid (and, with --row, ran without failure), 1 otherwise.\n";
+
+struct RowChoice {
+    std::string file;
+    long row = -1;
+};
+
+bool ParseRowChoice(const std::string& text, RowChoice* choice) {
+    const size_t colon = text.rfind(':');
+    if (colon == std::string::npos || colon + 1 == text.size()) return false;
+    char* end = nullptr;
+    choice->row = std::strtol(text.c_str() + colon + 1, &end, 10);
+    choice->file = text.substr(0, colon);
+    if (!choice->file.empty() && choice->file[0] == '/') choice->file = plat::paths::ToWindows(choice->file);
+    return *end == '\0' && choice->row >= 0 && !choice->file.empty();
+}
+
+// Runs the plan against the row and prints every cell that it changed.
+int RunOnRow(ExecutionPlan& plan, const RowChoice& choice) {
+    CContentTable table;
+    if (table.LoadFromFile(choice.file) < 0) {
+        std::fprintf(stderr, "pexupdate: cannot load the content file %s\n", choice.file.c_str());
+        return 1;
+    }
+    if (static_cast<std::uint32_t>(choice.row) >= table.RowCount()) {
+        std::fprintf(stderr, "pexupdate: %s has %u rows, no row %ld\n", choice.file.c_str(), table.RowCount(),
+                     choice.row);
+        return 1;
+    }
+    const auto row = static_cast<std::uint32_t>(choice.row);
+    std::vector<std::string> before;
+    for (std::uint32_t c = 0; c < table.ColumnCount(); ++c) before.push_back(table.Cell(row, c));
+    RowReference reference{table, row};
+    UpdateServices services(reference);
+    const std::int32_t hr = plan.Execute(services);
+    for (const std::string& comment : plan.Comments()) std::printf("failed: %s\n", comment.c_str());
+    for (std::uint32_t c = 0; c < table.ColumnCount(); ++c)
+        if (table.Cell(row, c) != before[c])
+            std::printf("changed: %s: '%s' -> '%s'\n", table.ColumnName(c).c_str(), before[c].c_str(),
+                        table.Cell(row, c).c_str());
+    std::printf(hr < 0 ? "executed with failures\n" : "executed\n");
+    return hr < 0 ? 1 : 0;
+}
 
 int RunScript(const std::vector<std::string>& args) {
-    if (args.size() != 1 || args[0] == "--help") {
-        bool help = args.size() == 1;
+    const bool help = args.size() == 1 && args[0] == "--help";
+    RowChoice choice;
+    const bool withRow = args.size() == 3 && args[1] == "--row";
+    if (help || !(args.size() == 1 || withRow) || (withRow && !ParseRowChoice(args[2], &choice))) {
         std::fputs(kUsage, help ? stdout : stderr);
         return help ? 0 : 2;
     }
@@ -37,7 +88,8 @@ int RunScript(const std::vector<std::string>& args) {
     bool valid = plan.Validate();
     for (const std::string& comment : plan.Comments()) std::printf("comment: %s\n", comment.c_str());
     std::printf(valid ? "valid\n" : "not valid\n");
-    return valid ? 0 : 1;
+    if (!valid) return 1;
+    return withRow ? RunOnRow(plan, choice) : 0;
 }
 
 const pextool::CommandRegistrar kScript({"script", "parse and check a dynamic-field script",

@@ -1,13 +1,17 @@
-// `pexupdate all` and `pexupdate product` as a person runs them. The library's log lives beside
-// Mendler.dll, shared by every run, so this is one test that runs the commands in turn.
+// `pexupdate script`, `all` and `product` as a person runs them. The library's log lives beside
+// Mendler.dll, shared by every run, so one test runs `all` and `product` in turn.
 #include <gtest/gtest.h>
 
+#ifndef _WIN32
 #include <sys/wait.h>
+#endif
 
 #include <algorithm>
 #include <cstdio>
 #include <string>
 
+#include "tests/support/platform_guard.h"
+#include "tests/support/run_pexupdate.h"
 #include "tests/support/test_machine.h"
 #include "tests/support/test_registry.h"
 #include "tests/support/trace_capture.h"
@@ -16,20 +20,8 @@ namespace reg = plat::reg;
 
 namespace {
 
-struct Outcome {
-    int exit = -1;
-    std::string out;
-};
-
-Outcome RunPex(const pextest::TestMachine& machine, const std::string& args) {
-    const std::string command = "'" PEXUPDATE_PATH "' --machine '" + machine.Root() + "' " + args + " 2>&1";
-    Outcome o;
-    FILE* pipe = popen(command.c_str(), "r");
-    char buffer[4096];
-    for (size_t n; (n = fread(buffer, 1, sizeof buffer, pipe)) > 0;) o.out.append(buffer, n);
-    const int status = pclose(pipe);
-    o.exit = WIFEXITED(status) ? WEXITSTATUS(status) : -1;
-    return o;
+pextest::CommandOutcome RunPex(const pextest::TestMachine& machine, const std::string& args) {
+    return pextest::RunPexupdate(PEXUPDATE_PATH, machine, args);
 }
 
 std::vector<std::string> LogLines() {
@@ -42,13 +34,26 @@ bool Has(const std::vector<std::string>& lines, const std::string& line) {
     return std::find(lines.begin(), lines.end(), line) != lines.end();
 }
 
+TEST(UpdateCommands, ScriptIsCheckedAndTriedOnARowWithoutChangingTheFile) {
+    pextest::TestMachine machine;
+    const std::string content = "FileName,Force Download\r\na.dll,0\r\n";
+    machine.WriteFile("C:\\content.csv", content);
+    pextest::CommandOutcome tried = RunPex(machine, "script 'FORCED = NOT FORCED' --row 'C:\\content.csv:0'");
+    EXPECT_EQ(tried.exit, 0) << tried.out;
+    EXPECT_EQ(tried.out, "item 1: SET(FORCED, NOT(FORCED))\nvalid\nchanged: Force Download: '0' -> '1'\nexecuted\n");
+    EXPECT_EQ(machine.ReadFile("C:\\content.csv"), content);
+    EXPECT_EQ(RunPex(machine, "script 'FORCED = TRUE' --row 'C:\\content.csv:1'").exit, 1);
+    EXPECT_EQ(RunPex(machine, "script 'FORCED = ' ").exit, 1);
+}
+
 TEST(UpdateCommands, AllAndProductRunTheLibraryAndExplainWhereTheLogIs) {
+    PEX_LINUX_ONLY();
     pextest::TestMachine machine;
     pextest::SetRegText(reg::kLocalMachine, "Software\\Vantric\\Pex\\Orlandel", "ContentFileName",
                         "C:\\Orlandel\\content.csv");
     machine.WriteFile("C:\\Orlandel\\content.csv", "FileName,UpgradeStatus\r\n");
 
-    Outcome all = RunPex(machine, "all");
+    pextest::CommandOutcome all = RunPex(machine, "all");
     EXPECT_EQ(all.exit, 0) << all.out;
     EXPECT_EQ(all.out.rfind("Analyzing data...\nDecompressing...\nApplying...\nCleaning up\nFinished.\n", 0), 0u) << all.out;
     EXPECT_NE(all.out.find("Trace log: "), std::string::npos);
@@ -58,7 +63,7 @@ TEST(UpdateCommands, AllAndProductRunTheLibraryAndExplainWhereTheLogIs) {
     EXPECT_TRUE(Has(lines, "UpdateAll, key 1 is 'Orlandel'"));
     EXPECT_TRUE(Has(lines, "CManifestParser: LoadManifest load from file success"));
 
-    Outcome product = RunPex(machine, "product Orlandel --quiet");
+    pextest::CommandOutcome product = RunPex(machine, "product Orlandel --quiet");
     EXPECT_EQ(product.exit, 0);
     EXPECT_EQ(product.out, "");
     lines = LogLines();
@@ -67,7 +72,7 @@ TEST(UpdateCommands, AllAndProductRunTheLibraryAndExplainWhereTheLogIs) {
     EXPECT_FALSE(Has(lines, "UpdateAll, main key is open"));
 
     EXPECT_EQ(RunPex(machine, "product").exit, 2);
-    Outcome help = RunPex(machine, "all --help");
+    pextest::CommandOutcome help = RunPex(machine, "all --help");
     EXPECT_EQ(help.exit, 0);
     EXPECT_EQ(help.out.rfind("usage: pexupdate", 0), 0u);
 }
