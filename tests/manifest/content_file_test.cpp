@@ -64,6 +64,30 @@ TEST_F(ContentFileTest, LoadPreparesRowsAndReadsTheMode) {
     EXPECT_TRUE(trace.Contains("CManifestParser: LoadManifest load from file success"));
 }
 
+TEST_F(ContentFileTest, RowScriptsRunUnescapedAndFailuresDoNotStopTheLoad) {
+    Register("");
+    machine.WriteFile(kContent,
+                      "FileName,Force Download,DynamicFieldInfo\n"
+                      "a.dll,0,FORCED = AND(TRUE&#x2C; TRUE)\n"
+                      "b.dll,0,FORCED = AND(TRUE&#x2c; FALSE)\n"
+                      "c.dll,0,\n"
+                      "d.dll,1,FORCED = NoSuchColumn\n"
+                      "e.dll,0,FORCED = (\n");
+    bool present = false;
+    ASSERT_TRUE(parser.LoadManifest("Zendor32", &present));
+    const std::vector<std::string> forced = {"1", "0", "0", "1", "0"};
+    for (std::int32_t row = 0; row < 5; ++row) {
+        ASSERT_TRUE(parser.MoveToRow(row));
+        EXPECT_EQ(parser.GetField("Force Download"), forced[row]) << row;
+    }
+    EXPECT_TRUE(trace.Contains("Evaluating Dynamic Fields for file a.dll: [FORCED = AND(TRUE, TRUE)]"));
+    EXPECT_TRUE(trace.Contains("Evaluating Dynamic Fields for file b.dll: [FORCED = AND(TRUE, FALSE)]"));
+    EXPECT_FALSE(trace.Contains("Evaluating Dynamic Fields for file c.dll: []"));
+    EXPECT_TRUE(trace.Contains("Evaluation Plan Not Valid.  Validation Results:"));
+    EXPECT_TRUE(trace.Contains("Error Creating Plan"));
+    EXPECT_TRUE(trace.Contains("CManifestParser: LoadManifest load from file success"));
+}
+
 TEST_F(ContentFileTest, ModeIsComparedExactly) {
     Register("mandatoryonly");
     machine.WriteFile(kContent, "FileName\r\n");
