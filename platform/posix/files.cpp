@@ -170,6 +170,9 @@ struct Finish {
     mode_t mode = 0644;
     const struct timespec* times = nullptr;  // access and write time to keep, or none
     bool syncFolder = false;
+    // The step that puts the new bytes in place is a rename of its own for the fault plan, so a
+    // plan can stop a whole-file write after the data is flushed but before the target changes.
+    bool renameStep = false;
 };
 
 // Fills a temporary file beside target, flushes it to the disk and renames it over target, so
@@ -187,6 +190,10 @@ bool ReplaceAtomically(const std::string& target, const std::function<bool(int)>
     if (close(fd) != 0 && ok) {
         ok = false;
         err = errno;
+    }
+    if (ok && finish.renameStep && !fault::Allow(fault::Op::Rename)) {
+        unlink(temp.c_str());
+        return false;
     }
     if (ok && rename(temp.c_str(), target.c_str()) != 0) {
         ok = false;
@@ -517,6 +524,7 @@ bool WriteAllDurably(const std::string& path, const std::string& bytes) {
     Finish finish;
     if (exists) finish.mode = st.st_mode;
     finish.syncFolder = true;
+    finish.renameStep = true;
     return ReplaceAtomically(
         host, [&bytes](int fd) { return WriteFully(fd, bytes.data(), bytes.size()); }, finish);
 }

@@ -138,6 +138,10 @@ TEST_F(ContentTableFile, AFailedSaveKeepsTheOldFile) {
     plat::fault::FailNth(plat::fault::Op::Write, 1, plat::kErrorDiskFull);
     expectRefused(plat::kErrorDiskFull);
     plat::fault::Clear();
+    // Written and flushed, then stopped before it replaces the file: the old file stays whole.
+    plat::fault::FailNth(plat::fault::Op::Rename, 1, plat::kErrorSharingViolation);
+    expectRefused(plat::kErrorSharingViolation);
+    plat::fault::Clear();
 
     ASSERT_TRUE(plat::files::SetAttributes(path, plat::files::kAttrReadOnly));
     expectRefused(plat::kErrorAccessDenied);
