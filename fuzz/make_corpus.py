@@ -37,12 +37,12 @@ write("content_table", "too_long_row", b"\x00" + b"A,B\r\n1,2,3\r\n")
 # --- dynamic-field texts: first byte picks the row's cells ---
 SCRIPTS = {
     "assign": "FORCED = TRUE",
-    "logic": "FORCED = AVAR AND (BVAR OR NOT CVAR) XOR FALSE",
-    "text": "HomeDir = AddPathSep(CONCAT(HomeDir, \"sub\\\\dir\")) & \"x\"; FileName = IIFS(TRUE, \"a\", \"b\")",
+    "logic": "FORCED = AVAR AND (BVAR OR NOT FORCED) XOR FALSE",
+    "text": "FORCED = IsUnderstood(CONCAT(AddPathSep(HomeDir), \"sub\\\\dir\") & IIFS(TRUE, \"a\", FileName))",
     "files": "FORCED = IIFB(IsUnderstood(\"FileExists\"), FileExists(AddPathSep(HomeDir) & FileName), "
              "FileVersionAtLeast(\"C:\\\\App\\\\a.dll\", \"1.2.3.4\"))",
-    "numbers": "FORCED = IIFN(TRUE, -3, 2.5); DOWNLOAD_FILE = Foo(1, 2)",
-    "invalid": "FORCED = AND(TRUE); SNOOZEABLE = \"a\\tb\\\"c\"",
+    "numbers": "FORCED = IIFB(TRUE, IsUnderstood(\"x\"), FALSE); FORCED = XOR(TRUE, AVAR)",
+    "invalid": "FORCED = AND(TRUE); DOWNLOAD_FILE = IIFN(TRUE, -3, 2.5); SNOOZEABLE = \"a\\tb\\\"c\"",
 }
 for i, (name, text) in enumerate(sorted(SCRIPTS.items())):
     write("execution_plan", name, bytes([i * 37 & 0xFF]) + text.encode())
