@@ -1,12 +1,17 @@
 // The content-file loader over any bytes: a downloaded content file is whatever the downloader
 // left on the disk. The first byte picks the loader's options; the rest is the file. Every
 // accessor and both renderings run over what was loaded, and the table's shape must hold
-// together whatever the outcome.
+// together whatever the outcome. A file in the content file's own form (header, commas) goes on,
+// when bit 3 asks for it, through the row preparation that follows every load: statuses,
+// install folders and every row's dynamic-field text.
 #include <cstdint>
 #include <cstdlib>
 #include <string>
 
+#include "commands/row_preparation.h"
+#include "fuzz/fuzz_machine.h"
 #include "manifest/content_table.h"
+#include "model/upgrade_status.h"
 
 namespace {
 
@@ -15,6 +20,12 @@ void Check(bool condition) {
 }
 
 }  // namespace
+
+extern "C" int LLVMFuzzerInitialize(int*, char***) {
+    pexfuzz::UseFreshMachine();
+    pexfuzz::PutFile("C:\\App\\a.dll", pexfuzz::ReadHostFile(PEX_FIXTURE_DIR "/versioned.dll"));
+    return 0;
+}
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
     if (size == 0) return 0;
@@ -31,6 +42,14 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
         return 0;
     }
     Check(table.ColumnCount() > 0);
+    if (header && separator == ',' && (options & 8)) {
+        const std::uint32_t columns = table.ColumnCount(), rows = table.RowCount();
+        NormalizeUpgradeStatus(table);
+        ResolveHomeDirs(table, "C:\\Program Files\\Vantric\\Demo");
+        EvaluateDynamicFields(table);
+        Check(table.ColumnCount() == columns && table.RowCount() == rows);
+    }
+
     table.keyColumn = options >> 4;  // also outside the table: the rendering must cope
     const std::string text = table.ToText();
     const std::string file = table.ToFileText(separator);

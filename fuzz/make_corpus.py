@@ -23,13 +23,16 @@ def write(target, name, data):
         f.write(data)
 
 
-# --- content table: first byte = options (bit 0 no header, bits 1-2 separator, bits 4-7 key) ---
+# --- content table: first byte = options (bit 0 no header, bits 1-2 separator, bit 3 row
+#     preparation, bits 4-7 key column) ---
 CONTENT = (
     "FileName,HomeDir,UpgradeStatus,Compression,Force Download,DynamicFieldInfo,Command\r\n"
     "a.dll,C:\\App,Downloaded,LZW,0,FORCED = TRUE,[RUN]setup.exe /q\r\n"
     "b.exe, \"C:\\Program Files\\App\" ,ApplicationFailed,None,1,,\r\n"
     "c.txt\r\n")
 write("content_table", "typical", b"\x00" + CONTENT.encode())
+write("content_table", "prepared", b"\x08" + CONTENT.encode() +
+      b"d.dll,\\Sub,Applied,ZLIB,1,FORCED = IIFB(FileExists(HomeDir&#x2C; \"x\")&#x2c; TRUE&#x2C; FALSE),\r\n")
 write("content_table", "lf_and_empty_line", b"\x10" + b"A,B,\na, b ,\n\nafter,the,end\n")
 write("content_table", "no_header_semicolon", b"\x03" + b"x;\"y\";z\rp;q\r")
 write("content_table", "too_long_row", b"\x00" + b"A,B\r\n1,2,3\r\n")
