@@ -32,7 +32,7 @@ CONTENT = (
     "c.txt\r\n")
 write("content_table", "typical", b"\x00" + CONTENT.encode())
 write("content_table", "prepared", b"\x08" + CONTENT.encode() +
-      b"d.dll,\\Sub,Applied,ZLIB,1,FORCED = IIFB(FileExists(HomeDir&#x2C; \"x\")&#x2c; TRUE&#x2C; FALSE),\r\n")
+      b"d.dll,\\Sub,Applied,ZLIB,1,FORCED = IIFB(FileExists(CONCAT(HomeDir&#x2C; \"x\"))&#x2c; TRUE&#x2C; FALSE),\r\n")
 write("content_table", "lf_and_empty_line", b"\x10" + b"A,B,\na, b ,\n\nafter,the,end\n")
 write("content_table", "no_header_semicolon", b"\x03" + b"x;\"y\";z\rp;q\r")
 write("content_table", "too_long_row", b"\x00" + b"A,B\r\n1,2,3\r\n")
