@@ -5,10 +5,12 @@
 #include <dirent.h>
 #include <strings.h>
 #include <sys/stat.h>
+#include <unistd.h>
 
 #include <algorithm>
 #include <cctype>
 #include <cerrno>
+#include <climits>
 #include <filesystem>
 #include <mutex>
 #include <vector>
@@ -81,13 +83,16 @@ std::string DriveHostFolder(const std::string& root, char letter) {
     const std::string devices = root + "/dosdevices";
     const std::string link = devices + "/" +
         static_cast<char>(std::tolower(static_cast<unsigned char>(letter))) + ":";
-    std::error_code ec;
-    fs::path target = fs::read_symlink(link, ec);
-    if (ec) {
+    // Every mapped path comes through here (every trace line opens its file anew), so the link
+    // is read with one call instead of a status query followed by the read.
+    char buffer[PATH_MAX];
+    const ssize_t length = readlink(link.c_str(), buffer, sizeof buffer);
+    if (length < 0 || static_cast<std::size_t>(length) >= sizeof buffer) {
         struct stat st;
         // A real folder in place of the link serves as the drive itself.
         return stat(link.c_str(), &st) == 0 && S_ISDIR(st.st_mode) ? link : std::string();
     }
+    fs::path target(std::string(buffer, static_cast<std::size_t>(length)));
     if (target.is_relative()) target = fs::path(devices) / target;
     std::string host = target.lexically_normal().string();
     while (host.size() > 1 && host.back() == '/') host.pop_back();
@@ -243,8 +248,23 @@ std::string ToHost(const std::string& winPath) {
         SetLastErrorCode(kErrorPathNotFound);
         return std::string();
     }
+    const std::vector<std::string> components = SplitComponents(full.substr(2));
+    // Most paths name existing files exactly as spelled, and then every component matches
+    // itself: one status query of the whole path stands for one per component. A new file in
+    // an exactly spelled folder needs only its own name matched.
+    std::string exact = host;
+    for (const std::string& c : components) exact = JoinHost(exact, c);
+    struct stat st;
+    if (lstat(exact.c_str(), &st) == 0) return exact;
+    if (components.size() > 1) {
+        const std::string folder = exact.substr(0, exact.size() - components.back().size() - 1);
+        if (stat(folder.c_str(), &st) == 0 && S_ISDIR(st.st_mode)) {
+            const std::string name = MatchChild(folder, components.back());
+            return JoinHost(folder, name.empty() ? components.back() : name);
+        }
+    }
     bool matching = true;
-    for (const std::string& c : SplitComponents(full.substr(2))) {
+    for (const std::string& c : components) {
         std::string name = matching ? MatchChild(host, c) : std::string();
         // Past the first missing component nothing can exist; the rest keeps the given case.
         if (name.empty()) {

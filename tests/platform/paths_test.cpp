@@ -102,6 +102,21 @@ TEST(ToHost, MatchesExistingComponentsWithoutRegardToCase) {
     EXPECT_EQ(plat::LastError(), plat::kErrorPathNotFound);
 }
 
+// Most paths are mapped in one status query of the whole path; that short cut must give what
+// matching component by component gives.
+TEST(ToHost, TheExactSpellingWinsAndNewNamesStillMatchOtherCases) {
+    pextest::TestMachine m;
+    m.WriteFile("C:\\app\\a.dll", "x");
+    std::ofstream(m.DriveC() + "/app/A.DLL") << "y";  // the host holds both spellings
+    std::ofstream(m.DriveC() + "/app/Only.txt") << "z";
+    EXPECT_EQ(plat::paths::ToHost("C:\\app\\A.DLL"), m.DriveC() + "/app/A.DLL");
+    EXPECT_EQ(plat::paths::ToHost("C:\\app\\a.dll"), m.DriveC() + "/app/a.dll");
+    EXPECT_EQ(plat::paths::ToHost("C:\\app\\ONLY.TXT"), m.DriveC() + "/app/Only.txt");
+    EXPECT_EQ(plat::paths::ToHost("C:\\APP\\only.txt"), m.DriveC() + "/app/Only.txt");
+    EXPECT_EQ(plat::paths::ToHost("C:\\app\\New.txt"), m.DriveC() + "/app/New.txt");
+    EXPECT_EQ(plat::paths::ToHost("C:\\"), m.DriveC());
+}
+
 TEST(ToWindows, NamesTheDriveThatHoldsTheHostPathElseZ) {
     pextest::TestMachine m;
     m.WriteFile("C:\\app\\a.dll", "x");

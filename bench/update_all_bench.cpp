@@ -1,0 +1,265 @@
+// Whole update runs as a host makes them (`pexupdate --machine DIR all`: load Mendler.dll, start
+// its log, UpdateAll over the registered products), each beside the floor program (pexfloor,
+// floor.c) doing the same file work with the same durability on an identical machine, in the
+// same repetition. Every file is installed over an existing target, so every file is backed up.
+//
+// Scenarios:
+//   small   1,000 files of 64 KiB, one group each (no FileGroup, as most content files have)
+//   large   8 files of 64 MiB, one group each
+//   files/N N files of 4 KiB in one group: the cost per file
+//   groups/N N files of 4 KiB, one group each: the cost per group (the content file is
+//           written back after every group)
+//   chain/N N files of 4 KiB in N groups, each depending on the group that sorts after it, so
+//           that every pass of the application loop applies exactly one group
+//
+// The time of a repetition is the UpdateAll run; the counters carry the floor's time beside it.
+#include <benchmark/benchmark.h>
+#include <fcntl.h>
+#include <spawn.h>
+#include <sys/resource.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <chrono>
+#include <cstdio>
+#include <filesystem>
+#include <stdexcept>
+#include <string>
+#include <vector>
+
+#include "platform/machine.h"
+#include "platform/registry.h"
+
+extern char** environ;
+
+namespace {
+
+namespace fs = std::filesystem;
+namespace reg = plat::reg;
+
+struct Scenario {
+    int files;
+    std::size_t size;
+    enum Grouping { kOneGroupEach, kOneGroup, kChain } grouping;
+};
+
+const char* const kProductKey = "Software\\Vantric\\Pex\\Bench";
+const char* const kContent = "C:\\Pex\\Bench_content.txt";
+
+std::string BinFolder() { return fs::read_symlink("/proc/self/exe").parent_path().string(); }
+
+std::string ScratchFolder() {
+    const char* base = std::getenv("PEX_BENCH_TMP");
+    const std::string folder = base && *base ? std::string(base) : fs::temp_directory_path().string();
+    fs::create_directories(folder);
+    return folder;
+}
+
+void WriteHostFile(const std::string& path, const std::string& bytes) {
+    const int fd = ::open(path.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0644);
+    bool ok = fd >= 0;
+    for (std::size_t done = 0; ok && done < bytes.size();) {
+        const ssize_t n = ::write(fd, bytes.data() + done, bytes.size() - done);
+        ok = n > 0;
+        done += ok ? static_cast<std::size_t>(n) : 0;
+    }
+    if (fd >= 0) ::close(fd);
+    if (!ok) throw std::runtime_error("cannot write " + path);
+}
+
+// Bytes of one version of the files: text-like, so that nothing can take a short cut.
+std::string Contents(std::size_t size, char version) {
+    std::string bytes;
+    bytes.reserve(size + 64);
+    for (unsigned line = 0; bytes.size() < size; ++line)
+        bytes += "Vantric module " + std::to_string(line * 2654435761u) + " version " + version + "\r\n";
+    bytes.resize(size);
+    return bytes;
+}
+
+// The bytes of file i: the shared bytes of its version, headed by the file's own tag.
+std::string Version(const std::string& shared, int file, char version) {
+    std::string bytes = shared;
+    const std::string tag = std::to_string(file) + version;
+    bytes.replace(0, std::min(tag.size(), bytes.size()), tag.substr(0, bytes.size()));
+    return bytes;
+}
+
+std::string FileName(int i) {
+    char name[32];
+    std::snprintf(name, sizeof name, "f%05d.dll", i);
+    return name;
+}
+
+std::string GroupName(int i) {
+    char name[32];
+    std::snprintf(name, sizeof name, "G%05d", i);
+    return name;
+}
+
+void SetText(const std::string& name, const std::string& text) {
+    reg::Key key;
+    if (reg::CreateKey(reg::kLocalMachine, kProductKey, reg::kKeyAllAccess, key.out(), nullptr) != 0 ||
+        reg::SetValue(key.get(), name, reg::kRegSz, reinterpret_cast<const std::uint8_t*>(text.c_str()),
+                      static_cast<std::uint32_t>(text.size() + 1)) != 0)
+        throw std::runtime_error("cannot write the product's registry entries");
+}
+
+// One machine with the product registered, its downloads and its installed targets, flushed
+// to the disk so that neither contender pays for the set-up's writes.
+class Machine {
+public:
+    explicit Machine(const Scenario& s) {
+        std::string tmpl = ScratchFolder() + "/pexrun-XXXXXX";
+        if (!mkdtemp(tmpl.data())) throw std::runtime_error("cannot create a machine root");
+        root_ = tmpl;
+        plat::machine::SetRoot(root_);
+        plat::machine::Ensure();
+        const std::string c = root_ + "/drive_c";
+        fs::create_directories(c + "/Pex/cache");
+        fs::create_directories(c + "/App");
+        std::string content =
+            "FileName,UpgradeStatus,HomeDir,DynamicFieldInfo,Force Download,Snoozable,InterestedParties,"
+            "DownLoadCacheFile,FileGroup,DependancyOrder,NeedsDecompression,Command,UpdateDate,Comment\r\n";
+        const std::string oldBytes = Contents(s.size, 'o'), newBytes = Contents(s.size, 'n');
+        for (int i = 0; i < s.files; ++i) {
+            const std::string name = FileName(i);
+            WriteHostFile(c + "/App/" + name, Version(oldBytes, i, 'o'));
+            WriteHostFile(c + "/Pex/cache/" + name + ".new", Version(newBytes, i, 'n'));
+            pairs_ += c + "/App/" + name + "\t" + c + "/Pex/cache/" + name + ".new\n";
+            std::string group, depends;
+            if (s.grouping == Scenario::kOneGroup) group = "Everything";
+            if (s.grouping == Scenario::kChain) {
+                group = GroupName(i);
+                if (i + 1 < s.files) depends = GroupName(i + 1);
+            }
+            content += name + ",Downloaded,C:\\App,,0,0,Nobody,C:\\Pex\\cache\\" + name + ".new," + group + "," +
+                       depends + ",0,,,\r\n";
+        }
+        WriteHostFile(c + "/Pex/Bench_content.txt", content);
+        SetText("ContentFileName", kContent);
+        SetText("ContentFileMode", "");
+        SetText("ContentFileTarget", "");
+        SetText("DefaultPath", "C:\\App");
+        WriteHostFile(root_ + "/pairs.txt", pairs_);
+        // The registry is closed so that the run opens it as the only user.
+        plat::machine::SetRoot(ScratchFolder());
+        sync();
+    }
+    ~Machine() {
+        std::error_code ec;
+        fs::remove_all(root_, ec);
+    }
+    const std::string& Root() const { return root_; }
+    std::string PairsFile() const { return root_ + "/pairs.txt"; }
+    std::string DriveC() const { return root_ + "/drive_c"; }
+
+private:
+    std::string root_, pairs_;
+};
+
+struct Timing {
+    double seconds = -1;  // wall time; negative when the program failed
+    double cpu = 0;       // user and system time of the program
+};
+
+// Runs a program to its end.
+Timing Run(const std::vector<std::string>& args) {
+    std::vector<char*> argv;
+    for (const std::string& a : args) argv.push_back(const_cast<char*>(a.c_str()));
+    argv.push_back(nullptr);
+    posix_spawn_file_actions_t actions;
+    posix_spawn_file_actions_init(&actions);
+    posix_spawn_file_actions_addopen(&actions, 1, "/dev/null", O_WRONLY, 0);
+    const auto start = std::chrono::steady_clock::now();
+    pid_t pid = 0;
+    int status = 0;
+    struct rusage usage {};
+    const bool spawned = posix_spawn(&pid, argv[0], &actions, nullptr, argv.data(), environ) == 0;
+    posix_spawn_file_actions_destroy(&actions);
+    Timing t;
+    if (!spawned || wait4(pid, &status, 0, &usage) != pid) return t;
+    const double seconds = std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
+    t.cpu = static_cast<double>(usage.ru_utime.tv_sec + usage.ru_stime.tv_sec) +
+            static_cast<double>(usage.ru_utime.tv_usec + usage.ru_stime.tv_usec) * 1e-6;
+    if (WIFEXITED(status) && WEXITSTATUS(status) == 0) t.seconds = seconds;
+    return t;
+}
+
+// A run starts without an earlier log, so that no run pays for rotating another's.
+void ForgetLogs(const std::string& bin) {
+    std::error_code ec;
+    fs::remove(bin + "/log/pex_support_mendler.log", ec);
+    fs::remove(bin + "/log/pex_support_mendler.bak", ec);
+}
+
+// A complete success: the content file is gone and the targets hold their new bytes.
+bool Installed(const Machine& m, int files) {
+    std::error_code ec;
+    if (fs::exists(m.DriveC() + "/Pex/Bench_content.txt", ec)) return false;
+    for (int i : {0, files - 1}) {
+        const std::string tag = std::to_string(i) + 'n';
+        std::string head(tag.size(), '\0');
+        const int fd = ::open((m.DriveC() + "/App/" + FileName(i)).c_str(), O_RDONLY | O_CLOEXEC);
+        if (fd < 0) return false;
+        const bool read = ::read(fd, head.data(), head.size()) == static_cast<ssize_t>(head.size());
+        ::close(fd);
+        if (!read || head != tag) return false;
+    }
+    return true;
+}
+
+void BM_UpdateAll(benchmark::State& state, Scenario scenario) {
+    const std::string bin = BinFolder();
+    Timing mendler, floor;
+    for (auto _ : state) {
+        {
+            Machine m(scenario);
+            ForgetLogs(bin);
+            mendler = Run({bin + "/pexupdate", "--machine", m.Root(), "all", "--quiet"});
+            if (mendler.seconds < 0 || !Installed(m, scenario.files)) {
+                state.SkipWithError("the update run failed");
+                break;
+            }
+        }
+        {
+            Machine m(scenario);
+            floor = Run({bin + "/pexfloor", m.PairsFile()});
+            if (floor.seconds < 0) {
+                state.SkipWithError("the floor program failed");
+                break;
+            }
+        }
+        state.SetIterationTime(mendler.seconds);
+    }
+    state.counters["mendler_s"] = mendler.seconds;
+    state.counters["floor_s"] = floor.seconds;
+    state.counters["mendler_cpu_s"] = mendler.cpu;
+    state.counters["floor_cpu_s"] = floor.cpu;
+    state.counters["ratio"] = floor.seconds > 0 ? mendler.seconds / floor.seconds : 0;
+    state.counters["files"] = scenario.files;
+    state.counters["bytes"] = static_cast<double>(scenario.size) * scenario.files;
+}
+
+void Register(const std::string& name, Scenario scenario, int repetitions) {
+    benchmark::RegisterBenchmark(("BM_UpdateAll/" + name).c_str(), BM_UpdateAll, scenario)
+        ->Iterations(1)
+        ->Repetitions(repetitions)
+        ->UseManualTime()
+        ->Unit(benchmark::kMillisecond);
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+    Register("small", {1000, 64u << 10, Scenario::kOneGroupEach}, 3);
+    Register("large", {8, 64u << 20, Scenario::kOneGroupEach}, 3);
+    for (int n : {10, 100, 1000, 10000}) Register("files/" + std::to_string(n), {n, 4096, Scenario::kOneGroup}, n < 10000 ? 3 : 1);
+    for (int n : {10, 100, 1000}) Register("groups/" + std::to_string(n), {n, 4096, Scenario::kOneGroupEach}, n < 1000 ? 3 : 1);
+    for (int n : {10, 30, 100, 300, 1000}) Register("chain/" + std::to_string(n), {n, 4096, Scenario::kChain}, n < 300 ? 3 : 1);
+    benchmark::Initialize(&argc, argv);
+    if (benchmark::ReportUnrecognizedArguments(argc, argv)) return 1;
+    benchmark::RunSpecifiedBenchmarks();
+    benchmark::Shutdown();
+    return 0;
+}
