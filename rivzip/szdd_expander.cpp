@@ -113,6 +113,14 @@ void Expander::DecodeFastGroups(const std::uint8_t* stop) {
     std::uint8_t* out = out_;
     while (in <= inSafe && out < stop) {
         std::uint32_t flags = *in++;
+        if (flags == 0xFF) {
+            // Eight literals: what incompressible stretches are made of, copied without testing
+            // each flag (a branch that noise makes unpredictable).
+            std::memcpy(out, in, 8);
+            in += 8;
+            out += 8;
+            continue;
+        }
         for (int item = 0; item < 8; ++item, flags >>= 1) {
             if (flags & 1) {
                 *out++ = *in++;
