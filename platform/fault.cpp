@@ -24,6 +24,7 @@ struct Plan {
     std::vector<Rule> rules;
     int mutations = 0;
     int crashAt = 0;  // 0: no crash planned
+    int operations[static_cast<int>(Op::Any) + 1] = {};  // by kind; Any counts every kind
 };
 
 Plan& ThePlan() {
@@ -56,6 +57,7 @@ void Clear() {
     plan.rules.clear();
     plan.mutations = 0;
     plan.crashAt = 0;
+    for (int& count : plan.operations) count = 0;
 }
 
 bool Allow(Op op) {
@@ -65,6 +67,8 @@ bool Allow(Op op) {
         // A power cut: no destructors, no buffered output, no clean-up of any kind.
         std::_Exit(kCrashExitCode);
     }
+    ++plan.operations[static_cast<int>(op)];
+    ++plan.operations[static_cast<int>(Op::Any)];
     bool allowed = true;
     for (Rule& rule : plan.rules) {
         if (rule.op != op && rule.op != Op::Any) continue;
@@ -82,6 +86,12 @@ int MutationCount() {
     Plan& plan = ThePlan();
     std::lock_guard<std::mutex> hold(plan.lock);
     return plan.mutations;
+}
+
+int OperationCount(Op op) {
+    Plan& plan = ThePlan();
+    std::lock_guard<std::mutex> hold(plan.lock);
+    return plan.operations[static_cast<int>(op)];
 }
 
 }  // namespace plat::fault

@@ -29,4 +29,8 @@ bool Allow(Op op);
 // Mutating operations counted since the last Clear (for the crash-point tests).
 int MutationCount();
 
+// Operations of the kind (Any: of every kind) checked since the last Clear, whether or not a
+// rule failed them, so that a test can make each of them fail in turn.
+int OperationCount(Op op);
+
 }  // namespace plat::fault

@@ -65,6 +65,21 @@ TEST_F(FaultPlan, OnlyMutatingOperationsAreCounted) {
     EXPECT_EQ(fault::MutationCount(), 4);
 }
 
+// A test that fails each operation of a run in turn needs to know how many there are, by kind;
+// operations that a rule fails are counted too.
+TEST_F(FaultPlan, OperationsAreCountedByKindWhetherOrNotTheyFail) {
+    fault::FailNth(Op::Copy, 1, plat::kErrorDiskFull);
+    EXPECT_FALSE(fault::Allow(Op::Copy));
+    EXPECT_TRUE(fault::Allow(Op::Copy));
+    EXPECT_TRUE(fault::Allow(Op::ProcessStart));
+    EXPECT_EQ(fault::OperationCount(Op::Copy), 2);
+    EXPECT_EQ(fault::OperationCount(Op::ProcessStart), 1);
+    EXPECT_EQ(fault::OperationCount(Op::Remove), 0);
+    EXPECT_EQ(fault::OperationCount(Op::Any), 3);
+    fault::Clear();
+    EXPECT_EQ(fault::OperationCount(Op::Any), 0);
+}
+
 TEST_F(FaultPlan, TheProcessEndsJustBeforeTheChosenMutation) {
     const pid_t child = fork();
     ASSERT_GE(child, 0);
