@@ -1,21 +1,11 @@
 #include "decompress/in_place_expansion.h"
 
-#include "commands/platform_utilities.h"
+#include "decompress/expansion_record.h"
 #include "diag/trace_log.h"
 #include "platform/errors.h"
 #include "platform/files.h"
 
 namespace {
-
-constexpr int kTempNameAttempts = 3;
-
-std::string TempName() {
-    for (int attempt = 0; attempt < kTempNameAttempts; ++attempt) {
-        std::string name = sGetTempFileName();
-        if (!name.empty()) return name;
-    }
-    return std::string();
-}
 
 // A failed close cannot change the outcome any more: the data has been written or the
 // expansion has already failed.
@@ -26,67 +16,73 @@ void CloseQuietly(plat::CFile& file) {
     }
 }
 
-// Opens both files and expands temp into path. *truncated tells whether path was opened for
-// writing, and so no longer holds the download.
-bool ExpandCopy(const char* operation, const std::string& path, const std::string& temp,
-                const Expander& expand, bool* truncated) {
-    plat::CFile source, destination;
-    if (!source.Open(temp, plat::CFile::modeRead | plat::CFile::shareDenyWrite | plat::CFile::typeBinary)) {
-        TRACE(g_TraceLog, "CDecompressionObjects::%s, Unable to open temp file for decompress operation.", operation);
+// Flushed before it is renamed, so that the name never points at data still in the cache.
+bool FlushQuietly(plat::CFile& file) {
+    try {
+        file.Flush();
+        return true;
+    } catch (const plat::CFileException&) {
         return false;
     }
-    TRACE(g_TraceLog, "CDecompressionObjects::%s, open of '%s' successfull", operation, temp.c_str());
-    if (!destination.Open(path, plat::CFile::modeCreate | plat::CFile::modeWrite | plat::CFile::shareExclusive |
-                                    plat::CFile::typeBinary)) {
+}
+
+// Expands the download at path into staging; the download itself is only read.
+bool ExpandInto(const char* operation, const std::string& path, const std::string& staging, const Expander& expand) {
+    plat::CFile source, destination;
+    if (!source.Open(path, plat::CFile::modeRead | plat::CFile::shareDenyWrite | plat::CFile::typeBinary)) {
+        TRACE(g_TraceLog, "CDecompressionObjects::%s, Unable to open the download for decompress operation.", operation);
+        return false;
+    }
+    TRACE(g_TraceLog, "CDecompressionObjects::%s, open of '%s' successfull", operation, path.c_str());
+    if (!destination.Open(staging, plat::CFile::modeCreate | plat::CFile::modeWrite | plat::CFile::shareExclusive |
+                                       plat::CFile::typeBinary)) {
         TRACE(g_TraceLog, "CDecompressionObjects::%s, Unable to open target file for decompress operation.", operation);
         CloseQuietly(source);
         return false;
     }
-    TRACE(g_TraceLog, "CDecompressionObjects::%s, open of '%s' successfull", operation, path.c_str());
-    *truncated = true;
+    TRACE(g_TraceLog, "CDecompressionObjects::%s, open of '%s' successfull", operation, staging.c_str());
     const std::int32_t result = expand(source, destination);
-    if (result >= 0)
+    const bool expanded = result >= 0 && FlushQuietly(destination);
+    if (expanded)
         TRACE(g_TraceLog, "CDecompressionObjects::%s, Decompress succeeded", operation);
     else
         TRACE(g_TraceLog, "CDecompressionObjects::%s, Decompress failed, return code is 0x%x.", operation,
               static_cast<unsigned>(result));
     CloseQuietly(destination);
     CloseQuietly(source);
-    return result >= 0;
+    return expanded;
 }
 
-// Puts the compressed download back after a failed expansion, so a later run can try again
-// instead of installing a partly written file. False when the copy back failed.
-bool Restore(const char* operation, const std::string& path, const std::string& temp) {
-    if (plat::files::Copy(temp, path, false)) {
-        TRACE(g_TraceLog, "CDecompressionObjects::%s, restored the compressed file '%s' from '%s'", operation,
-              path.c_str(), temp.c_str());
-        return true;
+// Records the expansion, then lets it take the download's name in one step.
+bool PutInPlace(const char* operation, const std::string& path, const std::string& staging) {
+    if (!RecordExpansion(path, staging)) {
+        TRACE(g_TraceLog, "CDecompressionObjects::%s, Unable to record the expansion of '%s', GetLastError returns %d",
+              operation, path.c_str(), static_cast<int>(plat::LastError()));
+        return false;
     }
-    TRACE(g_TraceLog,
-          "CDecompressionObjects::%s, Unable to restore the compressed file '%s' from '%s', GetLastError returns %d, "
-          "'%s' is kept",
-          operation, path.c_str(), temp.c_str(), static_cast<int>(plat::LastError()), temp.c_str());
-    return false;
+    if (!plat::files::Rename(staging, path, true)) {
+        TRACE(g_TraceLog, "CDecompressionObjects::%s, Unable to put the expansion in place of '%s', GetLastError returns %d",
+              operation, path.c_str(), static_cast<int>(plat::LastError()));
+        DiscardExpansionRecord(path);
+        return false;
+    }
+    TRACE(g_TraceLog, "CDecompressionObjects::%s, '%s' replaced by its expansion", operation, path.c_str());
+    return true;
 }
 
 }  // namespace
 
 bool ExpandInPlace(const char* operation, const std::string& path, const Expander& expand) {
-    const std::string temp = TempName();
-    if (temp.empty()) {
-        TRACE(g_TraceLog, "CDecompressionObjects::%s, unable to get Temp file name", operation);
-        return false;
+    if (IsRecordedExpansion(path)) {
+        TRACE(g_TraceLog,
+              "CDecompressionObjects::%s, '%s' holds the expansion that an earlier run made and did not record, "
+              "not expanding it again",
+              operation, path.c_str());
+        return true;
     }
-    bool expanded = false, truncated = false;
-    if (!plat::files::Copy(path, temp, false)) {
-        TRACE(g_TraceLog, "CDecompressionObjects::%s, Unable to copy file for decompress operation.", operation);
-    } else {
-        TRACE(g_TraceLog, "CDecompressionObjects::%s, rename from '%s' to '%s' successfull", operation, path.c_str(),
-              temp.c_str());
-        expanded = ExpandCopy(operation, path, temp, expand, &truncated);
-    }
-    const bool keepTemp = !expanded && truncated && !Restore(operation, path, temp);
-    if (!keepTemp) plat::files::Remove(temp);
+    DiscardExpansionRecord(path);  // a stale one names other bytes; a new one is written below
+    const std::string staging = path + ".$new$";
+    const bool expanded = ExpandInto(operation, path, staging, expand) && PutInPlace(operation, path, staging);
+    if (!expanded && plat::files::Exists(staging)) plat::files::Remove(staging);
     return expanded;
 }

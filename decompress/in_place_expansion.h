@@ -1,13 +1,13 @@
-// ExpandInPlace: replaces a downloaded file by its expansion, by way of a temporary copy of the
-// compressed data: copy the file to a new temporary name, open the copy for reading and the
-// file itself anew for writing, expand one into the other, close both, delete the copy.
+// ExpandInPlace: replaces a downloaded file by its expansion without ever leaving it torn: the
+// download is read and expanded into a staging file beside it ("<download>.$new$"), which is
+// flushed, recorded (expansion_record.h) and then renamed over the download in one step.
 //
-// Returns true when expand gave zero or more. Every step writes its trace line, prefixed
-// "CDecompressionObjects::<operation>, ". The file is left as it was on every failure: before
-// it is opened for writing nothing touches it; once it has been truncated and the expansion
-// fails, the compressed data is copied back from the temporary copy. When that copy back fails
-// too, the temporary copy is kept (its name is in the log) so the download is not lost; in every
-// other case no temporary file remains.
+// Returns true when expand gave zero or more and the expansion took the download's place, and
+// also, without expanding again, when the download already holds the expansion that its record
+// names (a run ended after the swap, before the content file said so). Every step writes its
+// trace line, prefixed "CDecompressionObjects::<operation>, ". On every failure the download
+// stays exactly as it arrived and no staging file remains; a run ended at any moment leaves
+// either the whole download or the whole expansion under the download's name.
 #pragma once
 #include <cstdint>
 #include <functional>

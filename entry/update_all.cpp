@@ -5,6 +5,7 @@
 
 #include "diag/trace_log.h"
 #include "manifest/manifest_parser.h"
+#include "platform/cfile.h"
 #include "platform/registry.h"
 
 namespace reg = plat::reg;
@@ -54,9 +55,14 @@ extern "C" bool UpdateAll(ProgressCallback callback) {
         reg::Key products;
         if (reg::OpenKey(reg::kLocalMachine, "software\\vantric\\Pex", reg::kKeyRead, products.out()) == 0)
             LoopOverProducts(products.get(), callback);
-    } catch (...) {
+    } catch (const plat::CFileException& e) {
         // A product run that throws (a content file that cannot be written) ends the loop; the
-        // remaining products wait for the next run.
+        // remaining products wait for the next run. The trace says why the run stopped where
+        // it did: the run itself had no chance to.
+        TRACE(g_TraceLog, "UpdateAll, product run stopped, file error %u on '%s'", static_cast<unsigned>(e.OsError()),
+              e.FileName().c_str());
+    } catch (...) {
+        TRACE(g_TraceLog, "UpdateAll, product run stopped by an exception");
     }
     try {
         g_TraceLog.Close();

@@ -5,6 +5,7 @@
 #include "diag/trace_log.h"
 #include "manifest/manifest_parser.h"
 #include "model/upgrade_status.h"
+#include "platform/files.h"
 
 namespace {
 
@@ -43,11 +44,15 @@ void CManifestParser::DecompressFiles(std::int32_t& result, ProgressCallback cal
             TRACE(g_TraceLog, "CManifestParser: Examining file '%s' to see if it needs decompressing ( %d, %d, %d )",
                   file.GetFileName().c_str(), mandatoryOnly_ ? 1 : 0, file.IsMandatory() ? 1 : 0,
                   file.IsDecompressionNeeded() ? 1 : 0);
+            // The row says the download is expanded: a record left by a run that ended before
+            // it could remove it (below) has done its work.
+            if (!file.IsDecompressionNeeded()) file.ExpansionRecorded();
             if ((mandatoryOnly_ && !file.IsMandatory()) || !file.IsDecompressionNeeded()) continue;
             Report(callback, "Decompressing " + file.GetFileName());
             if (file.Decompress(callback)) {
                 SetField(static_cast<std::int32_t>(file.GetRow()), "NeedsDecompression", "0");
                 WriteManifest();
+                file.ExpansionRecorded();
             } else {
                 ++result;
             }
@@ -166,18 +171,50 @@ void CManifestParser::CleanUp(std::int32_t result, ProgressCallback callback) {
               "CManifestParser: ProcessUpdateInformation, success, deleting content file '%s', removing reg key "
               "entry, removing backup files, removing temp files.",
               contentFilePath_.c_str());
-        DiscardContentFile();
-        Step(callback);
     } else {
         TRACE(g_TraceLog, "CManifestParser: ProcessUpdateInformation,  not a complete success, performing needed cleanup");
         WriteManifest();
     }
+    // Backups and downloads go while the content file still names them, and the content file
+    // goes only once they are gone: whatever is left (a run that ends in here, a deletion that
+    // fails) is found by the next run through the rows, which read as applied, and removed
+    // there (RemoveLeftoversOfCommittedRows). Discarded first, nothing would name them again.
+    bool cleaned = true;
     for (auto& [key, group] : masterList_) {
         for (CFile_& file : group.GetFiles()) {
             TRACE(g_TraceLog, "CManifestParser: ProcessUpdateInformation, removing backup file for '%s'",
                   file.GetFileName().c_str());
-            file.RemoveBackupFile();
-            if (file.IsApplied()) file.Remove();
+            const bool noBackup = file.RemoveBackupFile();
+            // The download stays while a backup does: it is what proves the backup obsolete.
+            if (file.IsApplied()) cleaned = noBackup && file.ExpansionRecorded() && file.Remove() && cleaned;
         }
     }
+    cleaned = RemoveLeftoversOfCommittedRows() && cleaned;
+    if (result != 0) return;
+    if (!cleaned) {
+        TRACE(g_TraceLog,
+              "CManifestParser: ProcessUpdateInformation, clean-up incomplete, content file kept for the next run to "
+              "finish it");
+        return;
+    }
+    if (!DiscardContentFile()) {
+        TRACE(g_TraceLog, "CManifestParser: ProcessUpdateInformation, content file not discarded, the next run "
+                          "discards it");
+    }
+    Step(callback);
+}
+
+// Rows that read as applied are not admitted, so nothing else would look at what the run that
+// applied them left behind when it ended before its clean-up. False when some of it is left.
+bool CManifestParser::RemoveLeftoversOfCommittedRows() {
+    bool removed = true;
+    for (std::uint32_t row = 0; row < table_.RowCount(); ++row) {
+        if (table_.Field(row, "UpgradeStatus") != UpgradeStatus[kAppliedSuccessfully]) continue;
+        const std::string& download = table_.Field(row, "DownLoadCacheFile");
+        if (download.empty() || !plat::files::Exists(download)) continue;
+        CFile_ file(row, true, true, table_.Field(row, "HomeDir"), table_.Field(row, "FileName"), download,
+                    std::string(), std::string(), false, 0);
+        removed = file.RemoveLeftovers() && removed;
+    }
+    return removed;
 }

@@ -68,9 +68,25 @@ bool CManifestParser::SetField(std::int32_t row, const std::string& column, cons
     return table_.SetCell(static_cast<std::uint32_t>(row), static_cast<std::uint32_t>(index), value);
 }
 
+namespace {
+
+// Removes one entry of the product's section; true when it is gone, also when it never was.
+bool RemoveEntry(const CProfile& profile, const std::string& section, const char* entry) {
+    if (profile.WriteProfileEntry(section, entry, nullptr)) return true;
+    static const std::string kAbsent("\x01(absent)");
+    return profile.ReadProfileEntry(section, entry, kAbsent) == kAbsent;
+}
+
+}  // namespace
+
 bool CManifestParser::DiscardContentFile() {
-    profile_.WriteProfileEntry(projectSection_, "ContentFileMode", nullptr);
-    profile_.WriteProfileEntry(projectSection_, "ContentFileName", nullptr);
-    profile_.WriteProfileEntry(projectSection_, "ContentFileTarget", nullptr);
-    return plat::files::Remove(contentFilePath_);
+    // The file goes first and "ContentFileName", by which a run finds the file, goes last, and
+    // each step only once the one before it succeeded. A discard that fails or a run that ends
+    // on the way then leaves that entry naming a file that the next run loads, or fails to load,
+    // and discards again; never a file or entries that nothing names and nothing would remove.
+    const bool removed = plat::files::Remove(contentFilePath_) || !plat::files::Exists(contentFilePath_);
+    if (!removed) return false;
+    const bool mode = RemoveEntry(profile_, projectSection_, "ContentFileMode");
+    const bool target = RemoveEntry(profile_, projectSection_, "ContentFileTarget");
+    return mode && target && RemoveEntry(profile_, projectSection_, "ContentFileName");
 }

@@ -40,6 +40,10 @@ public:
     // Unloads the decompression library that Decompress loaded, if any (after each
     // decompression step of a run).
     static void UnloadDecompressor();
+    // Called once the content file says that the download needs no decompressing: the record
+    // by which a later run would recognise the expansion has done its work and is removed.
+    // True when none is left.
+    bool ExpansionRecorded() const;
 
     // path + ".$bak$", with "x" appended until no file or folder has that name.
     std::string MakeBackupFileName(std::string path) const;
@@ -72,11 +76,19 @@ public:
     // Deletes the downloaded copy; true when the deletion succeeded.
     bool Remove();
 
+    // For a file whose row an earlier run committed (applied) and that run ended before its
+    // clean-up: when the target holds exactly the downloaded bytes, the target's backups, the
+    // expansion record and then the download are deleted, as that clean-up would have done.
+    // Anything else is left alone. False when something it should delete is left.
+    bool RemoveLeftovers();
+
 private:
     std::string TargetDirectory() const;
     std::string TargetPath() const;
     std::int32_t Install();
     bool PreserveTarget(const std::string& target);
+    bool AdoptEarlierCopy(const std::string& target);
+    std::string ReusableBackup(const std::string& target) const;
     void InstallThroughSetup(const std::string& target);
     std::int32_t RunCommands();
     bool Undo();

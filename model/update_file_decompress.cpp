@@ -4,6 +4,7 @@
 #include <new>
 
 #include "decompress/decompression_objects.h"
+#include "decompress/expansion_record.h"
 #include "diag/trace_log.h"
 #include "model/update_file.h"
 
@@ -40,3 +41,5 @@ void CFile_::UnloadDecompressor() {
     // Without a decompressor no file has loaded the library, so there is nothing to unload.
     if (std::unique_ptr<CDecompressionObjects>& decompressor = SharedDecompressor()) decompressor->Unload();
 }
+
+bool CFile_::ExpansionRecorded() const { return DiscardExpansionRecord(DownLoadCacheFile); }

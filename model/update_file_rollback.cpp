@@ -36,6 +36,7 @@ bool CFile_::Undo() {
     if (BackupFileName.empty()) {
         // Nothing was backed up because there was no target before Apply.
         TRACE(g_TraceLog, "CFile_: No backup file name, removing original");
+        ClearReadOnly(target);  // a read-only copy (of a read-only download) must not stay for good
         if (!plat::files::Remove(target)) return false;
         TargetReplaced = false;
         return true;
@@ -45,6 +46,7 @@ bool CFile_::Undo() {
 
 bool CFile_::RestoreTarget(const std::string& target) {
     TRACE(g_TraceLog, "CFile_: Rolling back...");
+    ClearReadOnly(target);
     if (!plat::files::Copy(BackupFileName, target, false)) {
         TRACE(g_TraceLog, "CFile_: Rollback failed, retrying, error code is %d", plat::LastError());
         return false;
@@ -65,6 +67,9 @@ bool CFile_::RemoveBackupFile() {
               BackupFileName.c_str(), FileName.c_str());
         result = false;
     } else if (present) {
+        // A backup taken while the target's read-only attribute could not be cleared is
+        // read-only too, and would refuse its deletion in every later run.
+        ClearReadOnly(BackupFileName);
         result = plat::files::Remove(BackupFileName);
     }
     TRACE(g_TraceLog, "CFile_: RemoveBackupFile, returning %d", result);

@@ -1,7 +1,9 @@
 // The dispatcher by compression code, and downloads expanded in place: SZDD through Rivzip.dll,
-// zlib and gzip through zlib; a download that cannot be expanded stays as it arrived.
+// zlib and gzip through zlib; a download that cannot be expanded stays as it arrived, and one
+// expanded by a run that ended before recording it is recognised.
 #include <zlib.h>
 
+#include "decompress/expansion_record.h"
 #include "platform/cfile.h"
 #include "platform/errors.h"
 #include "platform/fault.h"
@@ -13,6 +15,7 @@ namespace dectest {
 namespace {
 
 constexpr char kPath[] = "C:\\dl\\app.exe";
+constexpr char kStaging[] = "C:\\dl\\app.exe.$new$";
 
 std::string Sample(std::size_t size) {
     std::string data(size, '\0');
@@ -67,14 +70,6 @@ protected:
         destination.Close();
         return machine_.ReadFile("C:\\packed");
     }
-    // The name that sGetTempFileName gave, from its trace line.
-    std::string TempName() const {
-        const std::string prefix = "CManifestParser: sGetTempFileName, return is '";
-        for (const std::string& line : trace_.Lines())
-            if (line.rfind(prefix, 0) == 0) return line.substr(prefix.size(), line.size() - prefix.size() - 1);
-        return std::string();
-    }
-
     CDecompressionObjects dispatcher_;
 };
 
@@ -94,15 +89,14 @@ TEST_F(InPlaceExpansion, LzwThroughTheLibrary) {
     const std::string original = Sample(3 << 20);
     EXPECT_TRUE(Expand(kCompressionLZW, Szdd(original), &Note));
     EXPECT_EQ(machine_.ReadFile(kPath), original);
-    const std::string temp = TempName(), p = "CDecompressionObjects::DecompressLZW, ";
+    const std::string p = "CDecompressionObjects::DecompressLZW, ";
     EXPECT_EQ(trace_.Lines(), (Lines{"CDecompressionObjects::Decompress, file is C:\\dl\\app.exe",
-                                     p + "file is C:\\dl\\app.exe", "CManifestParser: sGetTempFileName",
-                                     "CManifestParser: sGetTempFileName, return is '" + temp + "'",
-                                     p + "rename from 'C:\\dl\\app.exe' to '" + temp + "' successfull",
-                                     p + "open of '" + temp + "' successfull",
-                                     p + "open of 'C:\\dl\\app.exe' successfull", p + "Decompress succeeded",
-                                     p + "returning 1", "CDecompressionObjects::Decompress, returning 1"}));
-    EXPECT_FALSE(plat::files::Exists(temp));
+                                     p + "file is C:\\dl\\app.exe", p + "open of 'C:\\dl\\app.exe' successfull",
+                                     p + "open of 'C:\\dl\\app.exe.$new$' successfull", p + "Decompress succeeded",
+                                     p + "'C:\\dl\\app.exe' replaced by its expansion", p + "returning 1",
+                                     "CDecompressionObjects::Decompress, returning 1"}));
+    EXPECT_FALSE(plat::files::Exists(kStaging));
+    EXPECT_TRUE(IsRecordedExpansion(kPath)) << "until the content file says the download is expanded";
     EXPECT_EQ(lastReport.ItemDone, static_cast<std::int32_t>(original.size() >> 3));
 }
 
@@ -121,7 +115,7 @@ TEST_F(InPlaceExpansion, ZlibAndGzipStreams) {
     EXPECT_EQ(machine_.ReadFile(kPath), "");
 }
 
-TEST_F(InPlaceExpansion, AFailedExpansionPutsTheDownloadBack) {
+TEST_F(InPlaceExpansion, AFailedExpansionLeavesTheDownloadAsItArrived) {
     const std::string szdd = Szdd(Sample(200000)), zlib = Deflate(Sample(100000), kZlib);
     std::string flipped = zlib;
     flipped[zlib.size() / 2] ^= 0x55;
@@ -140,19 +134,47 @@ TEST_F(InPlaceExpansion, AFailedExpansionPutsTheDownloadBack) {
         const std::string p = c.code == kCompressionLZW ? "CDecompressionObjects::DecompressLZW, "
                                                         : "CDecompressionObjects::DecompressZLib, ";
         EXPECT_TRUE(trace_.Contains(p + "Decompress failed, return code is " + c.result));
-        EXPECT_TRUE(trace_.Contains(p + "restored the compressed file 'C:\\dl\\app.exe' from '" + TempName() + "'"));
-        EXPECT_FALSE(plat::files::Exists(TempName()));
+        EXPECT_FALSE(plat::files::Exists(kStaging));
+        EXPECT_FALSE(plat::files::Exists(ExpansionRecordName(kPath)));
     }
     EXPECT_TRUE(trace_.Contains("CDecompressionObjects::DecompressZLib, zlib reports: incorrect header check"))
         << "the last case's reason";
 
-    // When the copy back fails too, the compressed copy is kept and named.
-    plat::fault::FailNth(plat::fault::Op::Copy, 2, plat::kErrorAccessDenied);
-    EXPECT_FALSE(Expand(kCompressionZLIB, flipped));
-    const std::string temp = TempName();
-    EXPECT_TRUE(trace_.Contains("CDecompressionObjects::DecompressZLib, Unable to restore the compressed file "
-                                "'C:\\dl\\app.exe' from '" + temp + "', GetLastError returns 5, '" + temp + "' is kept"));
-    EXPECT_EQ(machine_.ReadFile(temp), flipped);
+    // The record cannot be written (the first rename is that of its durable write), or the
+    // expansion cannot take the download's name: the download stays, nothing else remains.
+    const std::string packed = Deflate(Sample(1000), kZlib);
+    for (int rename : {1, 2}) {
+        plat::fault::FailNth(plat::fault::Op::Rename, rename, plat::kErrorAccessDenied);
+        EXPECT_FALSE(Expand(kCompressionZLIB, packed));
+        plat::fault::Clear();
+        EXPECT_EQ(machine_.ReadFile(kPath), packed);
+        EXPECT_FALSE(plat::files::Exists(kStaging));
+        EXPECT_FALSE(plat::files::Exists(ExpansionRecordName(kPath)));
+    }
+    EXPECT_TRUE(trace_.Contains("CDecompressionObjects::DecompressZLib, Unable to put the expansion in place of "
+                                "'C:\\dl\\app.exe', GetLastError returns 5"));
+}
+
+// A run that ends after the expansion took the download's name, before the content file said
+// so, leaves an expanded download that the next run is asked to expand: its record proves
+// what it is. A record that names other bytes proves nothing and is replaced.
+TEST_F(InPlaceExpansion, AnExpansionThatWasNotRecordedIsRecognisedByItsRecord) {
+    const std::string original = Sample(70000), packed = Deflate(original, kGzip);
+    ASSERT_TRUE(Expand(kCompressionZLIB, packed));
+    trace_.Clear();
+    EXPECT_TRUE(dispatcher_.Decompress(kCompressionZLIB, kPath, nullptr));
+    EXPECT_EQ(machine_.ReadFile(kPath), original);
+    EXPECT_TRUE(trace_.Contains("CDecompressionObjects::DecompressZLib, 'C:\\dl\\app.exe' holds the expansion that "
+                                "an earlier run made and did not record, not expanding it again"));
+
+    // The same download published again over the expanded one: the record is stale.
+    EXPECT_TRUE(Expand(kCompressionZLIB, Deflate(original + "!", kZlib)));
+    EXPECT_EQ(machine_.ReadFile(kPath), original + "!");
+    EXPECT_TRUE(IsRecordedExpansion(kPath));
+    EXPECT_TRUE(DiscardExpansionRecord(kPath));
+    EXPECT_FALSE(plat::files::Exists(ExpansionRecordName(kPath)));
+    // Without a record an expanded download is never taken for expanded: it is not a stream.
+    EXPECT_FALSE(dispatcher_.Decompress(kCompressionZLIB, kPath, nullptr));
 }
 
 // Damage anywhere in a stream either hits a field that nothing checks (the gzip header's time or

@@ -6,6 +6,8 @@
 
 #include "entry/update_all.h"
 #include "manifest/manifest_parser.h"
+#include "platform/errors.h"
+#include "platform/fault.h"
 #include "tests/support/test_machine.h"
 #include "tests/support/test_registry.h"
 #include "tests/support/trace_capture.h"
@@ -79,6 +81,18 @@ TEST_F(UpdateAllTest, NullCallbackProcessesProductsAlike) {
     UpdateAll(nullptr);
     EXPECT_TRUE(trace.Contains("UpdateAll, key 1 is 'Pellow'"));
     EXPECT_TRUE(trace.Contains("CManifestParser: ProcessUpdateInformation, No content file exists, nothing to do"));
+}
+
+// The content file cannot be saved: the run stops there, and the trace says where and why.
+TEST_F(UpdateAllTest, AProductRunStoppedByAFileErrorIsTracedAndEndsTheLoop) {
+    pextest::SetRegText(reg::kLocalMachine, std::string(kProducts) + "\\Alpha", "ContentFileName", "C:\\alpha.txt");
+    pextest::CreateRegKey(reg::kLocalMachine, std::string(kProducts) + "\\Beta");
+    machine.WriteFile("C:\\alpha.txt", "FileName,UpgradeStatus\r\n");
+    plat::fault::FailNth(plat::fault::Op::Rename, 1, plat::kErrorDiskFull);  // the first save's last step
+    UpdateAll(nullptr);
+    plat::fault::Clear();
+    EXPECT_TRUE(trace.Contains("UpdateAll, product run stopped, file error 112 on 'C:\\alpha.txt'"));
+    EXPECT_FALSE(trace.Contains("UpdateAll, key 2 is 'Beta'"));
 }
 
 TEST_F(UpdateAllTest, SpecialFileNamesAreTrimmedAndUpperCased) {

@@ -235,4 +235,50 @@ TEST_F(UpdateFile, FailedDeletionOfANewTargetIsRetriedByTheNextRollback) {
     EXPECT_FALSE(Exists(kTarget));
 }
 
+// What a run finds of an earlier run that ended before it was done: the target already holding
+// the new bytes beside the backup of the previous version, or a backup taken just before the end.
+TEST_F(UpdateFile, LeftoversOfAnEndedRunAreTakenOverOnlyWhenTheirBytesProveWhatTheyAre) {
+    machine.WriteFile(kTarget, "new");
+    machine.WriteFile(kBackup, "old");
+    CFile_ copied = Make();
+    EXPECT_EQ(1, copied.Apply());
+    EXPECT_TRUE(trace.Contains("CFile_: 'C:\\App\\Sub\\a.dll' already holds this update, copied by an earlier run "
+                               "that did not finish; its previous version stays in 'C:\\App\\Sub\\a.dll.$bak$'"));
+    EXPECT_FALSE(Exists(std::string(kBackup) + "x")) << "the new bytes are not backed up over the previous version";
+    EXPECT_TRUE(copied.Rollback());
+    EXPECT_EQ("old", Read(kTarget));
+    EXPECT_FALSE(Exists(kBackup));
+
+    // The target as it is, already in a backup: that backup is taken again, not a second one.
+    machine.WriteFile(kBackup, "old");
+    CFile_ backedUp = Make();
+    EXPECT_EQ(1, backedUp.Apply());
+    EXPECT_EQ("old", Read(kBackup));
+    EXPECT_FALSE(Exists(std::string(kBackup) + "x"));
+    EXPECT_TRUE(backedUp.RemoveBackupFile());
+    EXPECT_FALSE(Exists(kBackup));
+
+    // The new bytes without a backup may have been there before the update: kept on rollback.
+    CFile_ unproven = Make();
+    EXPECT_EQ(1, unproven.Apply());
+    EXPECT_EQ("new", Read(kBackup));
+    EXPECT_TRUE(unproven.Rollback());
+    EXPECT_EQ("new", Read(kTarget));
+}
+
+TEST_F(UpdateFile, LeftoversOfACommittedFileGoOnlyWhileTheTargetHoldsTheDownload) {
+    const std::string older = std::string(kBackup) + "x";
+    machine.WriteFile(kTarget, "something else");
+    machine.WriteFile(kBackup, "old");
+    machine.WriteFile(older, "older");
+    CFile_ committed(7, true, true, "C:\\App\\Sub", "a.dll", kDownload, "", "", false, 0);
+    EXPECT_TRUE(committed.RemoveLeftovers());
+    EXPECT_TRUE(Exists(kBackup) && Exists(older) && Exists(kDownload)) << "nothing proves they are obsolete";
+
+    machine.WriteFile(kTarget, "new");
+    EXPECT_TRUE(committed.RemoveLeftovers());
+    EXPECT_FALSE(Exists(kBackup) || Exists(older) || Exists(kDownload));
+    EXPECT_EQ("new", Read(kTarget));
+}
+
 }  // namespace

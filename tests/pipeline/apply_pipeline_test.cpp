@@ -7,6 +7,8 @@
 #include "entry/update_all.h"
 #include "manifest/manifest_parser.h"
 #include "platform/cfile.h"
+#include "platform/errors.h"
+#include "platform/fault.h"
 #include "platform/files.h"
 #include "platform/setup_install.h"
 #include "tests/pipeline/pipeline_fixture.h"
@@ -171,6 +173,46 @@ TEST_F(ApplyPipeline, ASpecialFileResetsTheHostsSchedule) {
     std::string bytes;
     ASSERT_TRUE(pextest::GetRegValue(reg::kLocalMachine, key, "NextDate", &bytes));
     EXPECT_EQ(bytes, "");
+}
+
+// A run that ended after committing its groups, before its clean-up: the rows read as applied,
+// and the backups, downloads and expansion records it would have deleted are still there.
+TEST_F(ApplyPipeline, TheNextRunCleansUpAfterARunThatEndedBeforeItsCleanUp) {
+    ContentRow done = Row("done.dll", "new done", "G");
+    done["UpgradeStatus"] = "AppliedSuccessfully";
+    ContentRow expanded = Row("expanded.dll", "new expanded");
+    machine.WriteFile(expanded["DownLoadCacheFile"] + ".$exp$", "a record of an expansion");
+    ContentRow changed = Row("changed.dll", "new changed");
+    changed["UpgradeStatus"] = "AppliedSuccessfully";
+    Publish({done, expanded, changed});
+    machine.WriteFile("C:\\App\\done.dll", "new done");
+    machine.WriteFile("C:\\App\\done.dll.$bak$", "old done");
+    machine.WriteFile("C:\\App\\changed.dll", "changed since");
+    machine.WriteFile("C:\\App\\changed.dll.$bak$", "old changed");
+
+    EXPECT_EQ(Run(), 0);
+    EXPECT_FALSE(ExistsOnMachine("C:\\App\\done.dll.$bak$"));
+    EXPECT_FALSE(ExistsOnMachine(done["DownLoadCacheFile"]));
+    EXPECT_FALSE(ExistsOnMachine(expanded["DownLoadCacheFile"] + ".$exp$"));
+    EXPECT_EQ(Installed("expanded.dll"), "new expanded");
+    // Nothing proves what the changed target's backup is: it stays, and so does the download.
+    EXPECT_TRUE(ExistsOnMachine("C:\\App\\changed.dll.$bak$"));
+    EXPECT_TRUE(ExistsOnMachine(changed["DownLoadCacheFile"]));
+    EXPECT_FALSE(ExistsOnMachine(kContent));
+}
+
+// The content file goes before its entries and the entry that names it goes last, so a discard
+// cut short leaves the name of a missing file, which the next run discards.
+TEST_F(ApplyPipeline, ADiscardCutShortIsFinishedByTheNextRun) {
+    Publish({Row("one.dll", "one")});
+    plat::fault::FailNth(plat::fault::Op::RegWrite, 3, plat::kErrorAccessDenied);  // the name's removal
+    EXPECT_EQ(Run(), 0);
+    plat::fault::Clear();
+    EXPECT_FALSE(ExistsOnMachine(kContent));
+    EXPECT_TRUE(ContentEntriesPresent());
+    EXPECT_EQ(Run(), 0);
+    EXPECT_FALSE(ContentEntriesPresent());
+    EXPECT_TRUE(trace.Contains("CManifestParser: ProcessUpdateInformation, Unable to load Content file"));
 }
 
 }  // namespace
