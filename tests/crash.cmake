@@ -1,0 +1,23 @@
+# Crash safety and error injection: whole product runs ended or failed at every operation.
+# Each scenario starts from a copy of an emulated machine root, and the crash runs are forked
+# children, so these tests exist for the Linux emulation only.
+if(NOT WIN32)
+  find_package(ZLIB REQUIRED)
+  set(PEX_CRASH_SUPPORT
+      ${CMAKE_CURRENT_SOURCE_DIR}/crash/crash_product.cpp
+      ${CMAKE_CURRENT_SOURCE_DIR}/crash/machine_copies.cpp
+      ${CMAKE_CURRENT_SOURCE_DIR}/pipeline/pipeline_fixture.cpp
+      ${CMAKE_CURRENT_SOURCE_DIR}/rivzip/memory_streams.cpp)
+
+  pex_add_test(crash_points_test
+    SOURCES ${CMAKE_CURRENT_SOURCE_DIR}/crash/crash_points_test.cpp
+            ${CMAKE_CURRENT_SOURCE_DIR}/crash/child_run.cpp
+            ${PEX_CRASH_SUPPORT}
+    LIBS mendler_core rivzip_codec ZLIB::ZLIB)
+  add_dependencies(crash_points_test Rivzip pextestprog)
+
+  pex_add_test(crash_error_injection_test
+    SOURCES ${CMAKE_CURRENT_SOURCE_DIR}/crash/error_injection_test.cpp ${PEX_CRASH_SUPPORT}
+    LIBS mendler_core rivzip_codec ZLIB::ZLIB)
+  add_dependencies(crash_error_injection_test Rivzip pextestprog)
+endif()

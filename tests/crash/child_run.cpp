@@ -1,0 +1,60 @@
+#include "tests/crash/child_run.h"
+
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include "diag/trace_log.h"
+#include "entry/update_all.h"
+#include "platform/fault.h"
+
+namespace pextest {
+
+namespace {
+
+[[noreturn]] void RunAndLeave(int crashAt, int reportFd) {
+    plat::fault::Clear();
+    if (crashAt > 0) plat::fault::CrashAtMutation(crashAt);
+    g_TraceLog.enabled = false;
+    UpdateAll(nullptr);
+    const int mutations = plat::fault::MutationCount();
+    const bool reported = write(reportFd, &mutations, sizeof mutations) == sizeof mutations;
+    // No destructors: the parent's test objects (the machine root among them) are not ours.
+    _exit(reported ? 0 : 1);
+}
+
+}  // namespace
+
+ChildRun RunUpdateInChild(int crashAt) {
+    ChildRun run;
+    int fds[2];
+    if (pipe(fds) != 0) {
+        run.ending = "no pipe";
+        return run;
+    }
+    const pid_t child = fork();
+    if (child == 0) {
+        close(fds[0]);
+        RunAndLeave(crashAt, fds[1]);
+    }
+    close(fds[1]);
+    int mutations = 0;
+    const bool reported = child > 0 && read(fds[0], &mutations, sizeof mutations) == sizeof mutations;
+    close(fds[0]);
+    int status = 0;
+    if (child < 0 || waitpid(child, &status, 0) != child) {
+        run.ending = "no child";
+        return run;
+    }
+    if (WIFEXITED(status) && WEXITSTATUS(status) == plat::fault::kCrashExitCode) {
+        run.crashed = true;
+    } else if (WIFEXITED(status) && WEXITSTATUS(status) == 0 && reported) {
+        run.finished = true;
+        run.mutations = mutations;
+    } else {
+        run.ending = WIFSIGNALED(status) ? "signal " + std::to_string(WTERMSIG(status))
+                                         : "exit " + std::to_string(WEXITSTATUS(status));
+    }
+    return run;
+}
+
+}  // namespace pextest

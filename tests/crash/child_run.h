@@ -1,0 +1,21 @@
+// A product run in a child process that may be ended at any mutating operation, as a power cut
+// or a killed process would end it.
+#pragma once
+#include <string>
+
+namespace pextest {
+
+struct ChildRun {
+    bool crashed = false;   // ended by the fault plan just before the chosen operation
+    bool finished = false;  // UpdateAll returned
+    int mutations = 0;      // mutating operations of a finished run
+    std::string ending;     // how it ended otherwise (an exit code or a signal), for messages
+};
+
+// Forks; the child runs UpdateAll on the current machine and leaves without any clean-up.
+// With crashAt > 0 the child ends just before its crashAt-th mutating operation. The child
+// writes no trace: trace lines would count as operations of their own, and a crash between
+// two trace lines leaves the machine as a crash before the next real operation does.
+ChildRun RunUpdateInChild(int crashAt);
+
+}  // namespace pextest

@@ -1,0 +1,186 @@
+#include "tests/crash/crash_product.h"
+
+#include <zlib.h>
+
+#include <algorithm>
+
+#include "decompress/expansion_record.h"
+#include "platform/files.h"
+#include "tests/rivzip/memory_streams.h"
+#include "tests/support/test_registry.h"
+
+namespace reg = plat::reg;
+
+namespace pextest {
+
+namespace {
+
+// About 150 KB of text: the expansions write it in several pieces, each a crash point.
+std::string Payload(const std::string& name) {
+    std::string bytes;
+    for (int line = 0; bytes.size() < 150000; ++line)
+        bytes += name + " version 2, line " + std::to_string(line * 7919 % 100003) + "\r\n";
+    return bytes;
+}
+
+std::string Deflate(const std::string& bytes) {
+    uLongf size = compressBound(static_cast<uLong>(bytes.size()));
+    std::string out(size, '\0');
+    compress2(reinterpret_cast<Bytef*>(out.data()), &size,
+              reinterpret_cast<const Bytef*>(bytes.data()), static_cast<uLong>(bytes.size()), 9);
+    out.resize(size);
+    return out;
+}
+
+std::string Szdd(const std::string& bytes) {
+    const auto packed = rivziptest::Compress(rivziptest::Bytes(bytes.begin(), bytes.end()));
+    return std::string(packed.begin(), packed.end());
+}
+
+}  // namespace
+
+void CrashProduct::SetUp() {
+    SetRegText(reg::kLocalMachine, "Software\\Vantric\\Fetch", "Capabilities", "ZLIB;LZW");
+    SetRegText(reg::kLocalMachine, "Software\\Vantric\\Disk", "Capabilities", "LZW;None");
+    files_ = {
+        {"core.dll", true, "core 1.0", "core 2.0", "", "", false},
+        {"packed.exe", true, "packed 1.0", Payload("packed"), "", "", true},
+        {"app.exe", true, "app 1.0", "app 2.0", "", "", false},
+        {"readme.txt", false, "", "read me, 2.0", "", "", false},
+        {"data.cfg", true, "data 1.0", Payload("data"), "", "", true},
+    };
+    files_[1].published = Szdd(files_[1].newBytes);
+    files_[4].published = Deflate(files_[4].newBytes);
+    std::vector<ContentRow> rows;
+    const char* groups[] = {"Core", "Core", "App", "App", "Data"};
+    for (std::size_t i = 0; i < files_.size(); ++i) {
+        ProductFile& file = files_[i];
+        if (file.published.empty()) file.published = file.newBytes;
+        if (file.hadTarget) machine.WriteFile(file.Target(), file.oldBytes);
+        ContentRow row = Row(file.name, file.published, groups[i], i == 2 ? "Core" : "");
+        file.download = row["DownLoadCacheFile"];
+        if (file.expanded) {
+            row["NeedsDecompression"] = "1";
+            row["InterestedParties"] = file.name == "packed.exe" ? "Fetch;Disk" : "Fetch";
+        }
+        rows.push_back(row);
+    }
+    rows[0]["Command"] = std::string("[REGISTRY](STRING)HKLM\\") + kRegistryMark + "\\Core=2.0";
+    rows[2]["Command"] = "[TRY-RUN]pextestprog mark ran.txt";
+    rows[2]["UpdateDate"] = "2003-12-31 22:30:00";
+    ASSERT_TRUE(plat::files::SetAttributes(files_[1].Target(), plat::files::kAttrReadOnly));
+    Publish(rows);
+}
+
+std::string CrashProduct::Contents(const std::string& winPath) {
+    std::string bytes;
+    return plat::files::ReadAll(winPath, &bytes) ? bytes : std::string("(missing)");
+}
+
+std::vector<std::string> CrashProduct::Backups(const std::string& target) {
+    std::vector<std::string> found;
+    // A gap in the chain is possible (an earlier backup removed), so look a little further.
+    std::string name = target + ".$bak$";
+    for (int i = 0; i < 8; ++i, name += "x") {
+        if (plat::files::Exists(name)) found.push_back(Contents(name));
+    }
+    return found;
+}
+
+std::vector<std::string> CrashProduct::Names(const std::string& pattern) {
+    std::vector<std::string> names;
+    for (const auto& entry : plat::files::Find(pattern)) {
+        // A durable write ended between its flush and its rename leaves its temporary file
+        // (".pex~<name>.XXXXXX") beside the file it was to replace; nothing reads it.
+        if (entry.name.rfind(".pex~", 0) != 0) names.push_back(entry.name);
+    }
+    return names;
+}
+
+bool CrashProduct::ContentNamed() const {
+    std::string bytes;
+    return GetRegValue(reg::kLocalMachine, std::string("Software\\Vantric\\Pex\\") + kProduct,
+                       "ContentFileName", &bytes);
+}
+
+void CrashProduct::ExpectConsistent() const {
+    // A complete success deletes the content file, then its entries, the name last.
+    const bool named = ContentNamed(), present = plat::files::Exists(kContent);
+    if (!named || !present) {
+        EXPECT_FALSE(present) << "a content file that no entry names";
+        for (const ProductFile& file : files_) ExpectFileConsistent(file, nullptr, -1);
+        return;
+    }
+    CContentTable table;
+    ASSERT_EQ(table.LoadFromFile(kContent, true, ','), CContentTable::kOk) << "the content file does not load";
+    ASSERT_EQ(table.RowCount(), files_.size());
+    for (std::size_t i = 0; i < files_.size(); ++i) {
+        ASSERT_EQ(table.Field(static_cast<std::uint32_t>(i), "FileName"), files_[i].name);
+        ExpectFileConsistent(files_[i], &table, static_cast<int>(i));
+    }
+}
+
+// What the bytes are to the file: its previous version, its new one, its published download, or
+// something else (torn). Names keep failure messages short.
+std::string CrashProduct::Which(const ProductFile& file, const std::string& bytes) {
+    if (bytes == "(missing)") return bytes;
+    if (file.hadTarget && bytes == file.oldBytes) return "old";
+    if (bytes == file.newBytes) return "new";
+    if (bytes == file.published) return "published";
+    return "other (" + std::to_string(bytes.size()) + " bytes)";
+}
+
+void CrashProduct::ExpectFileConsistent(const ProductFile& file, const CContentTable* table, int row) const {
+    SCOPED_TRACE(file.name);
+    const auto index = static_cast<std::uint32_t>(row);
+    const std::string status = table ? table->Field(index, "UpgradeStatus") : "(discarded)";
+    const bool committed = !table || status == "AppliedSuccessfully";
+    const std::string target = Which(file, Contents(file.Target()));
+    if (file.hadTarget) {
+        EXPECT_TRUE(target == "old" || target == "new") << "target " << target;
+    } else {
+        EXPECT_TRUE(target == "(missing)" || target == "new") << "target " << target;
+    }
+    if (committed) {
+        EXPECT_EQ(target, "new") << "status " << status;
+    }
+    bool previousKept = false;
+    for (const std::string& backup : Backups(file.Target())) {
+        // A new file that an ended run had put in place is backed up like any file found there.
+        EXPECT_EQ(Which(file, backup), file.hadTarget ? "old" : "new") << "a backup of something else";
+        previousKept = previousKept || Which(file, backup) == "old";
+    }
+    if (!committed && file.hadTarget && target == "new") {
+        EXPECT_TRUE(previousKept) << "the previous version is gone, status " << status;
+    }
+    if (committed) return;
+    // A download still to be decompressed may already hold its expansion when the run ended
+    // before saving the row, as long as its expansion record vouches for exactly those bytes.
+    const bool compressed = table->Field(index, "NeedsDecompression") == "1";
+    const std::string download = Which(file, Contents(file.download));
+    if (compressed && download == "new") {
+        EXPECT_TRUE(IsRecordedExpansion(file.download)) << "an expanded download that asks for expansion";
+    } else {
+        EXPECT_EQ(download, compressed ? "published" : "new")
+            << "the download, status " << status << ", NeedsDecompression " << (compressed ? 1 : 0);
+    }
+}
+
+void CrashProduct::ExpectComplete() const {
+    EXPECT_FALSE(ContentEntriesPresent());
+    EXPECT_FALSE(plat::files::Exists(kContent));
+    for (const ProductFile& file : files_) {
+        EXPECT_EQ(Which(file, Contents(file.Target())), "new") << file.name;
+        EXPECT_TRUE(Backups(file.Target()).empty()) << file.name << " has a backup left";
+    }
+    EXPECT_EQ(Names("C:\\App\\*"), (std::vector<std::string>{"app.exe", "core.dll", "data.cfg", "packed.exe", "ran.txt",
+                                                   "readme.txt"}));
+    EXPECT_EQ(Names("C:\\Pex\\cache\\*"), std::vector<std::string>{}) << "downloads left";
+    EXPECT_EQ(Names("C:\\windows\\temp\\*"), std::vector<std::string>{}) << "temporary files left";
+    EXPECT_TRUE(plat::files::Exists(kRunMark));
+    std::string value;
+    EXPECT_TRUE(GetRegValue(reg::kLocalMachine, kRegistryMark, "Core", &value));
+    EXPECT_EQ(value, std::string("2.0", 4));
+}
+
+}  // namespace pextest
