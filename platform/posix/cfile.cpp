@@ -50,10 +50,12 @@ bool IsDirectory(const std::string& host) {
 }
 
 // Refusals that POSIX would not make: a folder cannot be opened as a file, and a file without
-// its write bit cannot be written even by root. 0 when the open may go ahead.
-std::uint32_t RefusalBeforeOpen(const std::string& host, bool writing) {
+// its write bit cannot be written even by root. Asked of the open descriptor, which costs no
+// second lookup of the path (the trace log opens its file for every line). 0 when the open may
+// stand.
+std::uint32_t RefusalOf(int fd, bool writing) {
     struct stat st;
-    if (stat(host.c_str(), &st) != 0) return 0;
+    if (fstat(fd, &st) != 0) return ErrorFromErrno(errno);
     if (S_ISDIR(st.st_mode)) return kErrorAccessDenied;
     if (writing && (st.st_mode & S_IWUSR) == 0) return kErrorAccessDenied;
     return 0;
@@ -90,12 +92,17 @@ bool CFile::Open(const std::string& path, unsigned flags, CFileException* error)
     if (fd_ >= 0) Close();
     std::string host = paths::ToHost(path);
     if (host.empty()) return fail(LastError() ? LastError() : kErrorPathNotFound);
-    if (std::uint32_t refusal = RefusalBeforeOpen(host, Writing(flags))) return fail(refusal);
 
-    // Truncation waits until the share check passed, so a file in use is never emptied.
+    // Truncation waits until the refusals and the share check passed, so a file that may not be
+    // written, or is in use, is never emptied. A folder opened for writing fails with EISDIR,
+    // which is "access denied" too.
     int oflags = AccessFlags(flags) | O_CLOEXEC | ((flags & modeCreate) ? O_CREAT : 0);
     int fd = ::open(host.c_str(), oflags, 0666);
     if (fd < 0) return fail(OpenError(errno, host));
+    if (std::uint32_t refusal = RefusalOf(fd, Writing(flags))) {
+        ::close(fd);
+        return fail(refusal);
+    }
     if (!ApplyShareMode(fd, flags)) {
         ::close(fd);
         return fail(kErrorSharingViolation);
