@@ -3,6 +3,8 @@
 #   ./run.sh test   install what is missing, build, run every test
 #   ./run.sh demo   install what is missing, build, update the products of the demo machine
 #   ./run.sh fuzz [SECONDS]   build the fuzz targets with clang and run each for SECONDS (not in CI)
+#   ./run.sh bench  build with optimisation into build-bench/, run every benchmark, write
+#                   docs/performance.md and its plots (not in CI; about ten minutes)
 # Both are idempotent and quick when nothing changed.
 set -euo pipefail
 cd "$(dirname "$0")"
@@ -37,9 +39,22 @@ cmd_demo() {
   bash tools/demo/demo.sh "$BUILD"
 }
 
+# The benchmarks build apart from the tests, optimised; the report needs gnuplot and python3.
+BENCH_PACKAGES=(libbenchmark-dev gnuplot-nox python3)
+BENCH_BUILD=build-bench
+
+cmd_bench() {
+  install_missing "${PACKAGES[@]}" "${BENCH_PACKAGES[@]}"
+  [ -f "$BENCH_BUILD/CMakeCache.txt" ] ||
+    cmake -S . -B "$BENCH_BUILD" -DCMAKE_BUILD_TYPE=Release -DPEX_BENCH=ON -DPEX_TESTS=OFF >/dev/null
+  cmake --build "$BENCH_BUILD" -j"$(nproc)"
+  bash bench/run_benchmarks.sh "$BENCH_BUILD"
+}
+
 case "${1:-}" in
   test) cmd_test ;;
   demo) cmd_demo ;;
   fuzz) shift; bash fuzz/run.sh "$@" ;;
-  *) echo "usage: ./run.sh test | demo | fuzz [SECONDS]" >&2; exit 2 ;;
+  bench) cmd_bench ;;
+  *) echo "usage: ./run.sh test | demo | fuzz [SECONDS] | bench" >&2; exit 2 ;;
 esac

@@ -3,14 +3,16 @@
 // floor.c) doing the same file work with the same durability on an identical machine, in the
 // same repetition. Every file is installed over an existing target, so every file is backed up.
 //
-// Scenarios:
-//   small   1,000 files of 64 KiB, one group each (no FileGroup, as most content files have)
-//   large   8 files of 64 MiB, one group each
-//   files/N N files of 4 KiB in one group: the cost per file
+// Scenarios (installed files 100 to a folder, C:\App\d000, d001, ..., unless said otherwise):
+//   small    1,000 files of 64 KiB, one group each (no FileGroup, as most content files have)
+//   small-grouped  the same files in 10 groups of 100
+//   large    8 files of 64 MiB in one folder, one group each
+//   files/N  N files of 4 KiB in one group: the cost per file
+//   folder/N N files of 4 KiB in one group, all in one folder: the cost of a crowded folder
 //   groups/N N files of 4 KiB, one group each: the cost per group (the content file is
-//           written back after every group)
-//   chain/N N files of 4 KiB in N groups, each depending on the group that sorts after it, so
-//           that every pass of the application loop applies exactly one group
+//            written back after every group)
+//   chain/N  N files of 4 KiB in N groups, each depending on the group that sorts after it, so
+//            that every pass of the application loop applies exactly one group
 //
 // The time of a repetition is the UpdateAll run; the counters carry the floor's time beside it.
 #include <benchmark/benchmark.h>
@@ -23,6 +25,7 @@
 #include <chrono>
 #include <cstdio>
 #include <filesystem>
+#include <map>
 #include <stdexcept>
 #include <string>
 #include <vector>
@@ -40,8 +43,18 @@ namespace reg = plat::reg;
 struct Scenario {
     int files;
     std::size_t size;
-    enum Grouping { kOneGroupEach, kOneGroup, kChain } grouping;
+    enum Grouping { kOneGroupEach, kOneGroup, kGroupsOf100, kChain } grouping;
+    // Installed files per folder (C:\App\d000, d001, ...); 0 puts them all in C:\App.
+    int perFolder = 100;
 };
+
+// The folder of file i, below C:\App.
+std::string FolderOf(const Scenario& s, int i) {
+    if (s.perFolder == 0) return "";
+    char name[16];
+    std::snprintf(name, sizeof name, "d%03d", i / s.perFolder);
+    return name;
+}
 
 const char* const kProductKey = "Software\\Vantric\\Pex\\Bench";
 const char* const kContent = "C:\\Pex\\Bench_content.txt";
@@ -123,18 +136,22 @@ public:
             "DownLoadCacheFile,FileGroup,DependancyOrder,NeedsDecompression,Command,UpdateDate,Comment\r\n";
         const std::string oldBytes = Contents(s.size, 'o'), newBytes = Contents(s.size, 'n');
         for (int i = 0; i < s.files; ++i) {
-            const std::string name = FileName(i);
-            WriteHostFile(c + "/App/" + name, Version(oldBytes, i, 'o'));
+            const std::string name = FileName(i), folder = FolderOf(s, i);
+            const std::string app = c + "/App" + (folder.empty() ? "" : "/" + folder);
+            fs::create_directories(app);
+            WriteHostFile(app + "/" + name, Version(oldBytes, i, 'o'));
             WriteHostFile(c + "/Pex/cache/" + name + ".new", Version(newBytes, i, 'n'));
-            pairs_ += c + "/App/" + name + "\t" + c + "/Pex/cache/" + name + ".new\n";
+            pairs_ += app + "/" + name + "\t" + c + "/Pex/cache/" + name + ".new\n";
             std::string group, depends;
             if (s.grouping == Scenario::kOneGroup) group = "Everything";
+            if (s.grouping == Scenario::kGroupsOf100) group = "Part" + std::to_string(i / 100);
             if (s.grouping == Scenario::kChain) {
                 group = GroupName(i);
                 if (i + 1 < s.files) depends = GroupName(i + 1);
             }
-            content += name + ",Downloaded,C:\\App,,0,0,Nobody,C:\\Pex\\cache\\" + name + ".new," + group + "," +
-                       depends + ",0,,,\r\n";
+            const std::string home = "C:\\App" + (folder.empty() ? "" : "\\" + folder);
+            content += name + ",Downloaded," + home + ",,0,0,Nobody,C:\\Pex\\cache\\" + name + ".new," + group +
+                       "," + depends + ",0,,,\r\n";
         }
         WriteHostFile(c + "/Pex/Bench_content.txt", content);
         SetText("ContentFileName", kContent);
@@ -148,14 +165,16 @@ public:
     }
     ~Machine() {
         std::error_code ec;
-        fs::remove_all(root_, ec);
+        if (!keep_) fs::remove_all(root_, ec);
     }
+    void Keep() { keep_ = true; }
     const std::string& Root() const { return root_; }
     std::string PairsFile() const { return root_ + "/pairs.txt"; }
     std::string DriveC() const { return root_ + "/drive_c"; }
 
 private:
     std::string root_, pairs_;
+    bool keep_ = false;
 };
 
 struct Timing {
@@ -194,13 +213,16 @@ void ForgetLogs(const std::string& bin) {
 }
 
 // A complete success: the content file is gone and the targets hold their new bytes.
-bool Installed(const Machine& m, int files) {
+bool Installed(const Machine& m, const Scenario& s) {
+    const int files = s.files;
     std::error_code ec;
     if (fs::exists(m.DriveC() + "/Pex/Bench_content.txt", ec)) return false;
     for (int i : {0, files - 1}) {
         const std::string tag = std::to_string(i) + 'n';
         std::string head(tag.size(), '\0');
-        const int fd = ::open((m.DriveC() + "/App/" + FileName(i)).c_str(), O_RDONLY | O_CLOEXEC);
+        const std::string folder = FolderOf(s, i);
+        const std::string path = m.DriveC() + "/App/" + (folder.empty() ? "" : folder + "/") + FileName(i);
+        const int fd = ::open(path.c_str(), O_RDONLY | O_CLOEXEC);
         if (fd < 0) return false;
         const bool read = ::read(fd, head.data(), head.size()) == static_cast<ssize_t>(head.size());
         ::close(fd);
@@ -217,7 +239,7 @@ void BM_UpdateAll(benchmark::State& state, Scenario scenario) {
             Machine m(scenario);
             ForgetLogs(bin);
             mendler = Run({bin + "/pexupdate", "--machine", m.Root(), "all", "--quiet"});
-            if (mendler.seconds < 0 || !Installed(m, scenario.files)) {
+            if (mendler.seconds < 0 || !Installed(m, scenario)) {
                 state.SkipWithError("the update run failed");
                 break;
             }
@@ -241,7 +263,15 @@ void BM_UpdateAll(benchmark::State& state, Scenario scenario) {
     state.counters["bytes"] = static_cast<double>(scenario.size) * scenario.files;
 }
 
+// PEX_BENCH_PREPARE=NAME makes the machine of one scenario and keeps it, for profiling a run by
+// hand (`pexupdate --machine ROOT all`, `pexfloor ROOT/pairs.txt`); it prints the root.
+std::map<std::string, Scenario>& Scenarios() {
+    static std::map<std::string, Scenario> all;
+    return all;
+}
+
 void Register(const std::string& name, Scenario scenario, int repetitions) {
+    Scenarios()[name] = scenario;
     benchmark::RegisterBenchmark(("BM_UpdateAll/" + name).c_str(), BM_UpdateAll, scenario)
         ->Iterations(1)
         ->Repetitions(repetitions)
@@ -252,11 +282,22 @@ void Register(const std::string& name, Scenario scenario, int repetitions) {
 }  // namespace
 
 int main(int argc, char** argv) {
-    Register("small", {1000, 64u << 10, Scenario::kOneGroupEach}, 3);
-    Register("large", {8, 64u << 20, Scenario::kOneGroupEach}, 3);
-    for (int n : {10, 100, 1000, 10000}) Register("files/" + std::to_string(n), {n, 4096, Scenario::kOneGroup}, n < 10000 ? 3 : 1);
-    for (int n : {10, 100, 1000}) Register("groups/" + std::to_string(n), {n, 4096, Scenario::kOneGroupEach}, n < 1000 ? 3 : 1);
+    const auto each = Scenario::kOneGroupEach, one = Scenario::kOneGroup;
+    Register("small", {1000, 64u << 10, each}, 3);
+    Register("small-grouped", {1000, 64u << 10, Scenario::kGroupsOf100}, 3);
+    Register("large", {8, 64u << 20, each, 0}, 3);
+    for (int n : {10, 100, 1000, 10000}) Register("files/" + std::to_string(n), {n, 4096, one}, n < 10000 ? 3 : 1);
+    for (int n : {10, 100, 1000}) Register("folder/" + std::to_string(n), {n, 4096, one, 0}, n < 1000 ? 3 : 1);
+    for (int n : {10, 100, 1000}) Register("groups/" + std::to_string(n), {n, 4096, each}, n < 1000 ? 3 : 1);
     for (int n : {10, 30, 100, 300, 1000}) Register("chain/" + std::to_string(n), {n, 4096, Scenario::kChain}, n < 300 ? 3 : 1);
+    if (const char* name = std::getenv("PEX_BENCH_PREPARE")) {
+        auto it = Scenarios().find(name);
+        if (it == Scenarios().end()) return 2;
+        Machine m(it->second);
+        m.Keep();
+        std::printf("%s\n", m.Root().c_str());
+        return 0;
+    }
     benchmark::Initialize(&argc, argv);
     if (benchmark::ReportUnrecognizedArguments(argc, argv)) return 1;
     benchmark::RunSpecifiedBenchmarks();
