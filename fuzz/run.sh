@@ -42,9 +42,12 @@ export UBSAN_OPTIONS=${UBSAN_OPTIONS:-halt_on_error=1:print_stacktrace=1}
 run_one() {
   local t=$1 corpus="$BUILD/corpus/$1" artifacts="$BUILD/artifacts/$1" log="$BUILD/logs/$1.log"
   mkdir -p "$corpus" "$artifacts" "$BUILD/logs"
+  local extra=()
+  # A dictionary of the input's words, where the format has them.
+  [ -f "fuzz/dict/$t.dict" ] && extra+=(-dict="fuzz/dict/$t.dict")
   # The parsers print their messages on standard output; -close_fd_mask=1 keeps the log readable.
   if "$BUILD/fuzz/${t}_fuzz" "$corpus" "fuzz/corpus/$t" -max_total_time="$SECONDS_EACH" \
-      -timeout=10 -rss_limit_mb=2048 -close_fd_mask=1 -print_final_stats=1 \
+      -timeout=10 -rss_limit_mb=2048 -close_fd_mask=1 -print_final_stats=1 "${extra[@]}" \
       -artifact_prefix="$artifacts/" >"$log" 2>&1; then
     echo "ok"
   else
