@@ -32,6 +32,10 @@ target_link_libraries(pex_system PUBLIC
   $<TARGET_NAME_IF_EXISTS:pex_registry>
   $<TARGET_NAME_IF_EXISTS:pex_framework>
   ${CMAKE_DL_LIBS})
+if(WIN32)
+  # Install at restart, version information and the message pump.
+  target_link_libraries(pex_system PUBLIC setupapi version user32)
+endif()
 list(APPEND PEX_PLATFORM_PARTS pex_system)
 pex_warnings(pex_system)
 
