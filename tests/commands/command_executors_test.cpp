@@ -13,6 +13,7 @@
 #include "platform/fault.h"
 #include "platform/files.h"
 #include "platform/registry.h"
+#include "tests/support/environment.h"
 #include "tests/support/test_machine.h"
 #include "tests/support/trace_capture.h"
 
@@ -67,8 +68,8 @@ std::string Sz(const std::string& text) { return text + '\0'; }
 // process would: through PEX_MACHINE.
 class MachineForModules {
 public:
-    explicit MachineForModules(const pextest::TestMachine& m) { setenv("PEX_MACHINE", m.Root().c_str(), 1); }
-    ~MachineForModules() { unsetenv("PEX_MACHINE"); }
+    explicit MachineForModules(const pextest::TestMachine& m) { pextest::SetEnvironment("PEX_MACHINE", m.Root()); }
+    ~MachineForModules() { pextest::RemoveEnvironment("PEX_MACHINE"); }
 };
 
 // Shortens the ten-minute wait of [RUN] for one test.

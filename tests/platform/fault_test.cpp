@@ -2,11 +2,14 @@
 #include "platform/fault.h"
 
 #include <gtest/gtest.h>
+#ifndef _WIN32
 #include <sys/wait.h>
 #include <unistd.h>
+#endif
 
 #include "platform/errors.h"
 #include "platform/files.h"
+#include "tests/support/platform_guard.h"
 #include "tests/support/test_machine.h"
 
 namespace {
@@ -80,7 +83,10 @@ TEST_F(FaultPlan, OperationsAreCountedByKindWhetherOrNotTheyFail) {
     EXPECT_EQ(fault::OperationCount(Op::Any), 0);
 }
 
+// The crash needs a child process that shares the test's state up to that point (fork).
 TEST_F(FaultPlan, TheProcessEndsJustBeforeTheChosenMutation) {
+    PEX_LINUX_ONLY();
+#ifndef _WIN32
     const pid_t child = fork();
     ASSERT_GE(child, 0);
     if (child == 0) {
@@ -96,6 +102,7 @@ TEST_F(FaultPlan, TheProcessEndsJustBeforeTheChosenMutation) {
     EXPECT_EQ(WEXITSTATUS(status), fault::kCrashExitCode);
     EXPECT_TRUE(plat::files::Exists("C:\\first.txt"));
     EXPECT_FALSE(plat::files::Exists("C:\\second.txt"));
+#endif
 }
 
 }  // namespace

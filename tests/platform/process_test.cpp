@@ -13,6 +13,7 @@
 #include "platform/fault.h"
 #include "platform/files.h"
 #include "platform/paths.h"
+#include "tests/support/environment.h"
 #include "tests/support/test_machine.h"
 
 namespace {
@@ -33,7 +34,7 @@ long RunToEnd(const std::string& line, const std::string& dir = "") {
 // Puts a copy of pextestprog on the machine under another name (its execute bit kept).
 void InstallTestProgram(const pextest::TestMachine& m, const std::string& winPath) {
     std::string app = plat::files::ModuleFileName(nullptr);
-    std::string prog = app.substr(0, app.find_last_of('\\') + 1) + "pextestprog";
+    std::string prog = app.substr(0, app.find_last_of('\\') + 1) + pextest::ProgramFile("pextestprog");
     m.WriteFile(winPath, "");
     std::filesystem::copy_file(plat::paths::ToHost(prog), plat::paths::ToHost(winPath),
                                std::filesystem::copy_options::overwrite_existing);
@@ -69,9 +70,9 @@ TEST(Process, ProgramsInTheCurrentFolderOnPathAndByFullPath) {
     EXPECT_EQ(RunToEnd("here exit 4"), 4);
 
     std::string saved = std::getenv("PATH") ? std::getenv("PATH") : "";
-    setenv("PATH", "C:\\nowhere;C:\\tools", 1);
+    pextest::SetEnvironment("PATH", "C:\\nowhere;C:\\tools");
     long onPath = RunToEnd("onpath.exe exit 5");
-    setenv("PATH", saved.c_str(), 1);
+    pextest::SetEnvironment("PATH", saved);
     EXPECT_EQ(onPath, 5);
 
     EXPECT_EQ(RunToEnd(R"("C:\Program Files\Vantric Tool\run me.exe" exit 6)"), 6);

@@ -1,17 +1,14 @@
-// Install at restart: a target in use (another open description holds a flock on it) is
+// Install at restart: a target in use (another opener holds it without sharing) is
 // staged beside itself and queued in PendingFileRenameOperations in Windows' own layout;
 // `pexupdate boot` carries the queue out.
 #include "platform/setup_install.h"
-
-#include <fcntl.h>
-#include <sys/file.h>
-#include <unistd.h>
 
 #include <gtest/gtest.h>
 
 #include <string>
 #include <vector>
 
+#include "platform/cfile.h"
 #include "platform/errors.h"
 #include "platform/files.h"
 #include "platform/paths.h"
@@ -29,18 +26,13 @@ constexpr std::uint32_t kStyle = plat::setup::kCopySourceAbsolute | plat::setup:
 // Holds a file in use, as a program that has it open without sharing does.
 class InUse {
 public:
-    explicit InUse(const std::string& winPath)
-        : fd_(open(plat::paths::ToHost(winPath).c_str(), O_RDONLY)) {
-        EXPECT_EQ(flock(fd_, LOCK_EX), 0);
+    explicit InUse(const std::string& winPath) {
+        EXPECT_TRUE(file_.Open(winPath, plat::CFile::modeRead | plat::CFile::shareExclusive));
     }
-    ~InUse() { Release(); }
-    void Release() {
-        if (fd_ >= 0) close(fd_);
-        fd_ = -1;
-    }
+    void Release() { file_.Close(); }
 
 private:
-    int fd_;
+    plat::CFile file_;
 };
 
 // The stored value: type and bytes.

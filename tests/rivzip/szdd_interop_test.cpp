@@ -7,6 +7,7 @@
 #include <filesystem>
 #include <fstream>
 #include <iterator>
+#include <random>
 #include <string>
 
 #include "tests/rivzip/memory_streams.h"
@@ -29,13 +30,21 @@ void WriteHostFile(const fs::path& path, const Bytes& bytes) {
     std::ofstream(path, std::ios::binary).write(reinterpret_cast<const char*>(bytes.data()), bytes.size());
 }
 
-bool HaveTool(const std::string& name) { return std::system(("command -v " + name + " >/dev/null").c_str()) == 0; }
+// The tools are Linux programs: a Windows build of the tests has none of them.
+bool HaveTool(const std::string& name) {
+#ifdef _WIN32
+    return name.empty();
+#else
+    return std::system(("command -v " + name + " >/dev/null").c_str()) == 0;
+#endif
+}
 
 // A host folder of this test's own, removed afterwards.
 struct ScratchFolder {
     ScratchFolder() {
-        std::string pattern = (fs::temp_directory_path() / "rivzip-interop-XXXXXX").string();
-        if (mkdtemp(pattern.data())) path = pattern;
+        fs::path candidate = fs::temp_directory_path() / ("rivzip-interop-" + std::to_string(std::random_device{}()));
+        std::error_code ec;
+        if (fs::create_directory(candidate, ec)) path = candidate;
     }
     ~ScratchFolder() {
         std::error_code ignored;

@@ -1,22 +1,48 @@
 #include "tests/support/run_pexupdate.h"
 
+#ifndef _WIN32
 #include <sys/wait.h>
+#endif
 
 #include <cstdio>
 
 namespace pextest {
 
+namespace {
+
+#ifdef _WIN32
+// cmd.exe runs the line: it quotes with double quotes, and it drops the first and the last
+// quote of a line that starts with one, hence the outer pair.
+std::string ShellLine(const std::string& pexupdatePath, const TestMachine& machine,
+                      const std::string& args) {
+    std::string line = "'" + pexupdatePath + "' --machine '" + machine.Root() + "' " + args;
+    for (char& c : line) c = c == '\'' ? '"' : c;
+    return "\"" + line + " 2>&1\"";
+}
+FILE* OpenPipe(const std::string& line) { return _popen(line.c_str(), "r"); }
+int ExitOf(FILE* pipe) { return _pclose(pipe); }
+#else
+std::string ShellLine(const std::string& pexupdatePath, const TestMachine& machine,
+                      const std::string& args) {
+    return "'" + pexupdatePath + "' --machine '" + machine.Root() + "' " + args + " 2>&1";
+}
+FILE* OpenPipe(const std::string& line) { return popen(line.c_str(), "r"); }
+int ExitOf(FILE* pipe) {
+    const int status = pclose(pipe);
+    return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+}
+#endif
+
+}  // namespace
+
 CommandOutcome RunPexupdate(const std::string& pexupdatePath, const TestMachine& machine,
                             const std::string& args) {
-    const std::string command =
-        "'" + pexupdatePath + "' --machine '" + machine.Root() + "' " + args + " 2>&1";
     CommandOutcome o;
-    FILE* pipe = popen(command.c_str(), "r");
+    FILE* pipe = OpenPipe(ShellLine(pexupdatePath, machine, args));
     if (!pipe) return o;
     char buffer[4096];
     for (size_t n; (n = fread(buffer, 1, sizeof buffer, pipe)) > 0;) o.out.append(buffer, n);
-    const int status = pclose(pipe);
-    o.exit = WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+    o.exit = ExitOf(pipe);
     return o;
 }
 

@@ -13,6 +13,7 @@ namespace fs = std::filesystem;
 
 namespace pextest {
 
+#ifndef _WIN32
 TestMachine::TestMachine() {
     std::string tmpl = (fs::temp_directory_path() / "pexmachine-XXXXXX").string();
     if (!mkdtemp(tmpl.data())) throw std::runtime_error("cannot create a test machine root");
@@ -27,6 +28,9 @@ TestMachine::~TestMachine() {
     // Read-only files stay removable on the host: the emulation only refuses through the platform.
     fs::remove_all(root_, ec);
 }
+
+std::string TestMachine::DriveC() const { return root_ + "/drive_c"; }
+#endif
 
 void TestMachine::WriteFile(const std::string& winPath, const std::string& bytes) const {
     fs::path host = plat::paths::ToHost(winPath);

@@ -1,5 +1,7 @@
 // A fresh emulated machine for one test: a new machine root in a temporary host folder,
-// removed again when the test ends.
+// removed again when the test ends. On Windows the machine is the real one: the test gets a
+// scratch folder as its root, and what it adds to the drive and the registry is removed again
+// (test_machine_win32.cpp).
 #pragma once
 #include <string>
 
@@ -13,8 +15,8 @@ public:
     TestMachine& operator=(const TestMachine&) = delete;
 
     const std::string& Root() const { return root_; }
-    // Host path of drive C: (root/drive_c).
-    std::string DriveC() const { return root_ + "/drive_c"; }
+    // Host path of drive C: (root/drive_c; on Windows "C:" itself).
+    std::string DriveC() const;
     // Writes a file by Windows path (creating its folders) with the given bytes.
     void WriteFile(const std::string& winPath, const std::string& bytes) const;
     // Reads a file by Windows path; empty when missing.
