@@ -5,6 +5,8 @@
 #   ./run.sh fuzz [SECONDS]   build the fuzz targets with clang and run each for SECONDS (not in CI)
 #   ./run.sh bench  build with optimisation into build-bench/, run every benchmark, write
 #                   docs/performance.md and its plots (not in CI; about ten minutes)
+#   ./run.sh windows   install mingw-w64 and Wine, cross-build for Windows x64 into build-win/,
+#                      run every test program under Wine in a throw-away prefix
 # Both are idempotent and quick when nothing changed.
 set -euo pipefail
 cd "$(dirname "$0")"
@@ -39,6 +41,70 @@ cmd_demo() {
   bash tools/demo/demo.sh "$BUILD"
 }
 
+# The Windows build: mingw-w64 (posix threads), zlib and GoogleTest's sources for it, and Wine.
+WINDOWS_PACKAGES=(cmake make mingw-w64 g++-mingw-w64-x86-64-posix libz-mingw-w64-dev googletest
+                  flex bison wine wine64)
+WINDOWS_BUILD=build-win
+# Seconds one test program may run under Wine before it counts as failed.
+WINE_TEST_TIMEOUT=${PEX_WINE_TEST_TIMEOUT:-300}
+
+# The output of the tests that failed, and whatever a program printed after its last test.
+failed_test_output() {
+  awk '/^\[ RUN      \]/ { buf = $0; next }
+       /^\[       OK \]|^\[  SKIPPED \]/ { buf = ""; next }
+       /^\[  FAILED  \] .*\(/ { print buf; print; buf = ""; next }
+       /^$|^Running main|^\[  FAILED  \]|^\[==========\]|^\[----------\]|^\[  PASSED  \]/ { next }
+       { buf = buf "\n" $0 }
+       END { if (buf != "") print buf }'
+}
+
+# Runs one test program under Wine from its own folder; prints its GoogleTest summary and adds
+# its counts to the totals. Returns non-zero when it failed or did not finish.
+run_wine_test() {
+  local program=$1 name out rc passed skipped failed
+  name=$(basename "$program" .exe)
+  rc=0
+  out=$(cd "$(dirname "$program")" && timeout -k 10 "$WINE_TEST_TIMEOUT" wine "$program" </dev/null 2>&1 | tr -d '\r') || rc=$?
+  passed=$(sed -n 's/^\[  PASSED  \] \([0-9]*\) tests\{0,1\}\..*/\1/p' <<<"$out")
+  skipped=$(sed -n 's/^\[  SKIPPED \] \([0-9]*\) tests\{0,1\}, listed below:/\1/p' <<<"$out")
+  failed=$(sed -n 's/^\[  FAILED  \] \([0-9]*\) tests\{0,1\}, listed below:/\1/p' <<<"$out")
+  WINE_PASSED=$((WINE_PASSED + ${passed:-0}))
+  WINE_SKIPPED=$((WINE_SKIPPED + ${skipped:-0}))
+  WINE_FAILED=$((WINE_FAILED + ${failed:-0}))
+  printf '%-40s %4s passed %4s skipped %4s failed\n' "$name" "${passed:-0}" "${skipped:-0}" "${failed:-0}"
+  if ((rc != 0)) || [ -z "$passed" ]; then
+    ((rc == 124)) && echo "  $name did not finish within ${WINE_TEST_TIMEOUT}s"
+    failed_test_output <<<"$out" | head -80 | sed 's/^/  /'
+    return 1
+  fi
+}
+
+cmd_windows() {
+  install_missing "${WINDOWS_PACKAGES[@]}"
+  [ -f "$WINDOWS_BUILD/CMakeCache.txt" ] ||
+    cmake -S . -B "$WINDOWS_BUILD" -DCMAKE_TOOLCHAIN_FILE=cmake/mingw-w64-x86_64.cmake \
+          -DCMAKE_BUILD_TYPE=Debug >/dev/null
+  cmake --build "$WINDOWS_BUILD" -j"$(nproc)"
+
+  WINEPREFIX=$(mktemp -d /tmp/pex-wine.XXXXXX)
+  export WINEPREFIX WINEDEBUG=-all
+  trap 'wineserver -k >/dev/null 2>&1 || true; rm -rf "$WINEPREFIX"' EXIT
+  echo "Preparing a Wine prefix in $WINEPREFIX"
+  # One server for the whole run: a new one for each program would start the prefix again. The
+  # prefix's services start here, apart from the tests, whose output pipes they would keep open.
+  wineserver -p </dev/null >/dev/null 2>&1
+  wine wineboot -i </dev/null >/dev/null 2>&1
+  WINE_PASSED=0 WINE_SKIPPED=0 WINE_FAILED=0
+  local program failures=0
+  while read -r program; do
+    [ -n "$program" ] || continue
+    run_wine_test "$program" || failures=$((failures + 1))
+  done <"$WINDOWS_BUILD/wine-tests.txt"
+  echo "Total under Wine: $WINE_PASSED passed, $WINE_SKIPPED skipped, $WINE_FAILED failed;" \
+       "$failures program(s) with failures"
+  ((failures == 0))
+}
+
 # The benchmarks build apart from the tests, optimised; the report needs gnuplot and python3.
 BENCH_PACKAGES=(libbenchmark-dev gnuplot-nox python3)
 BENCH_BUILD=build-bench
@@ -53,8 +119,9 @@ cmd_bench() {
 
 case "${1:-}" in
   test) cmd_test ;;
+  windows) cmd_windows ;;
   demo) cmd_demo ;;
   fuzz) shift; bash fuzz/run.sh "$@" ;;
   bench) cmd_bench ;;
-  *) echo "usage: ./run.sh test | demo | fuzz [SECONDS] | bench" >&2; exit 2 ;;
+  *) echo "usage: ./run.sh test | demo | windows | fuzz [SECONDS] | bench" >&2; exit 2 ;;
 esac
