@@ -4,7 +4,8 @@
 #   ./run.sh demo   install what is missing, build, update the products of the demo machine
 #   ./run.sh fuzz [SECONDS]   build the fuzz targets with clang and run each for SECONDS (not in CI)
 #   ./run.sh bench  build with optimisation into build-bench/, run every benchmark, write
-#                   docs/performance.md and its plots (not in CI; about ten minutes)
+#                   docs/performance.md and its plots (not in CI; 20 minutes or more on 2 cores,
+#                   about 10 with PEX_BENCH_QUICK=1, which leaves out the two largest runs)
 #   ./run.sh windows   install mingw-w64 and Wine, cross-build for Windows x64 into build-win/,
 #                      run every test program under Wine in a throw-away prefix
 # Both are idempotent and quick when nothing changed.

@@ -334,7 +334,8 @@ def update_section(results, docs, targets):
 
 
 def main():
-    results, docs = sys.argv[1], sys.argv[2]
+    results, docs = sys.argv[1], os.path.abspath(sys.argv[2])
+    os.makedirs(docs, exist_ok=True)
     with open(os.path.join(results, "run.json")) as f:
         run = json.load(f)
     targets = []
