@@ -237,9 +237,11 @@ bool WriteAllDurably(const std::string& path, const std::string& bytes) {
                                   FILE_ATTRIBUTE_NORMAL, nullptr));
         ok = file && WriteFully(file.get(), bytes) && ::FlushFileBuffers(file.get());
     }
-    // Write-through: the rename is on the disk before the call returns.
-    ok = ok && ::MoveFileExA(temp.c_str(), path.c_str(),
-                             MOVEFILE_REPLACE_EXISTING | MOVEFILE_WRITE_THROUGH);
+    // Putting the new bytes in place is a step of its own for the fault plan, so a plan can stop
+    // the write after the data is flushed but before the target changes. Write-through: the
+    // rename is on the disk before the call returns.
+    ok = ok && fault::Allow(fault::Op::Rename) &&
+         ::MoveFileExA(temp.c_str(), path.c_str(), MOVEFILE_REPLACE_EXISTING | MOVEFILE_WRITE_THROUGH);
     if (!ok) {
         const DWORD err = ::GetLastError();
         ::DeleteFileA(temp.c_str());

@@ -11,6 +11,7 @@
 
 #include "platform/errors.h"
 #include "platform/fault.h"
+#include "platform/paths.h"
 #include "platform/win32/windows_api.h"
 
 namespace plat::proc {
@@ -63,6 +64,20 @@ void Forget(int id) {
     ::CloseHandle(h);
 }
 
+// CreateProcess reports a program in a missing folder as a missing file on some systems (Wine);
+// the platform tells the two apart, as Windows' own file calls do: 3 when the folder is missing.
+std::uint32_t StartError(const std::string& commandLine) {
+    const DWORD error = ::GetLastError();
+    const std::vector<std::string> args = SplitCommandLine(commandLine);
+    if (error != ERROR_FILE_NOT_FOUND || args.empty()) return error;
+    const std::string program = paths::FullPath(args[0]);
+    const std::size_t cut = program.find_last_of('\\');
+    if (args[0].find_first_of("\\/:") == std::string::npos || cut == std::string::npos) return error;
+    const DWORD folder = ::GetFileAttributesA(program.substr(0, cut + 1).c_str());
+    const bool missing = folder == INVALID_FILE_ATTRIBUTES || !(folder & FILE_ATTRIBUTE_DIRECTORY);
+    return missing ? std::uint32_t{kErrorPathNotFound} : error;
+}
+
 // Records the end of a process whose handle is signalled.
 WaitResult Ended(Process& p, HANDLE h) {
     DWORD code = 0;
@@ -112,6 +127,7 @@ bool Start(const std::string& commandLine, const std::string& directory, Process
     PROCESS_INFORMATION info{};
     if (!::CreateProcessA(nullptr, line.data(), nullptr, nullptr, FALSE, 0, nullptr,
                           directory.empty() ? nullptr : directory.c_str(), &startup, &info)) {
+        SetLastErrorCode(StartError(commandLine));
         return false;
     }
     ::CloseHandle(info.hThread);

@@ -3,6 +3,7 @@
 #include "platform/fault.h"
 #include "platform/registry.h"
 #include "platform/win32/registry_handle.h"
+#include "platform/win32/registry_journal.h"
 
 namespace plat::reg {
 
@@ -50,6 +51,7 @@ long CreateKey(HKey parent, const std::string& subKey, std::uint32_t access, HKe
     *result = nullptr;
     if (Probe(parent, subKey) == ERROR_FILE_NOT_FOUND) {
         if (long rc = win32::AllowWrite()) return Done(rc);
+        win32::journal::BeforeCreateKey(Native(parent), subKey);
     }
     HKEY key = nullptr;
     DWORD outcome = 0;
@@ -70,6 +72,7 @@ long CloseKey(HKey key) {
 long DeleteKey(HKey parent, const std::string& subKey) {
     if (long rc = Probe(parent, subKey)) return Done(rc);
     if (long rc = win32::AllowWrite()) return Done(rc);
+    win32::journal::BeforeDeleteKey(Native(parent), subKey);
     return Done(::RegDeleteKeyA(Native(parent), subKey.c_str()));
 }
 

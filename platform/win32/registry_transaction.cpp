@@ -1,17 +1,21 @@
-// A batch of registry writes on Windows. The system's transacted registry (RegCreateKeyTransacted)
-// exists on Windows Vista and later but not under Wine, where the tests run, so a batch here
-// groups nothing: every write takes effect at once and a batch that is not committed leaves
-// its writes in place.
+// A batch of registry writes on Windows, kept by the undo journal (registry_journal.h).
 #include "platform/reg_transaction.h"
+
+#include "platform/errors.h"
+#include "platform/win32/registry_journal.h"
 
 namespace plat::reg {
 
-Transaction::Transaction() : status_(0), open_(true) {}
+Transaction::Transaction() : status_(0), open_(true), outer_(win32::journal::Begin()) {}
 
-Transaction::~Transaction() = default;
+Transaction::~Transaction() {
+    if (open_) win32::journal::End(false);
+}
 
 long Transaction::Commit() {
+    if (!open_) return status_ ? status_ : long{kErrorInvalidHandle};  // already ended
     open_ = false;
+    win32::journal::End(true);
     return 0;
 }
 

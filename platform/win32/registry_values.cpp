@@ -1,7 +1,10 @@
 // Registry values through RegQueryValueExA and its siblings: the data is handed over as the
 // bytes given, with the system's own size rules.
+#include <vector>
+
 #include "platform/registry.h"
 #include "platform/win32/registry_handle.h"
+#include "platform/win32/registry_journal.h"
 
 namespace plat::reg {
 
@@ -31,14 +34,23 @@ long SetValue(HKey key, const std::string& name, std::uint32_t type, const std::
               std::uint32_t size) {
     if (!data && size) return Done(kErrorInvalidParameter);
     if (long rc = win32::AllowWrite()) return Done(rc);
-    return Done(::RegSetValueExA(Native(key), name.c_str(), 0, type,
-                                 reinterpret_cast<const BYTE*>(data), size));
+    // RegSetValueExA looks one byte past a text's given size and counts a NUL it finds there as
+    // part of the value. The bytes are handed over with a non-zero byte after them, so the
+    // value is stored exactly as given.
+    std::vector<BYTE> bytes(data, data + size);
+    bytes.push_back(0xFF);
+    win32::journal::BeforeSetValue(Native(key), name);
+    return Done(::RegSetValueExA(Native(key), name.c_str(), 0, type, bytes.data(), size));
 }
 
 long DeleteValue(HKey key, const std::string& name) {
+    // The plan is asked only when there is something to delete; the call itself still checks
+    // the handle's rights first.
     const long found = ::RegQueryValueExA(Native(key), name.c_str(), nullptr, nullptr, nullptr, nullptr);
-    if (found != ERROR_SUCCESS) return Done(found);
-    if (long rc = win32::AllowWrite()) return Done(rc);
+    if (found == ERROR_SUCCESS) {
+        if (long rc = win32::AllowWrite()) return Done(rc);
+        win32::journal::BeforeDeleteValue(Native(key), name);
+    }
     return Done(::RegDeleteValueA(Native(key), name.c_str()));
 }
 

@@ -28,9 +28,9 @@ bool Unavailable(const std::string& winPath, DWORD error) {
     std::string image;
     if (!files::ReadAll(winPath, &image)) return false;
     std::string unused;
-    const pe::Lookup found = pe::FirstResourceOfType(image, pe::kRtVersion, &unused);
-    return Fail(found == pe::Lookup::NotFound ? kErrorResourceTypeNotFound
-                                              : kErrorResourceDataNotFound);
+    const bool module = pe::LooksLikeImage(image) &&
+                        pe::FirstResourceOfType(image, pe::kRtVersion, &unused) != pe::Lookup::NotImage;
+    return Fail(module ? kErrorResourceTypeNotFound : kErrorResourceDataNotFound);
 }
 
 }  // namespace
