@@ -13,6 +13,7 @@
 #include "platform/fault.h"
 #include "platform/files.h"
 #include "platform/setup_install.h"
+#include "tests/support/platform_guard.h"
 #include "tests/support/test_machine.h"
 #include "tests/support/trace_capture.h"
 
@@ -170,6 +171,7 @@ TEST_F(UpdateFile, CommandsRunInTheHomeDirectoryAndTheirFailureIsUndone) {
 // A program holds the target open (it may be read, not replaced): the copy goes to the restart
 // queue, and the file does not count as applied, so neither date nor commands happen.
 TEST_F(UpdateFile, InUseTargetIsQueuedForRestartAndNotApplied) {
+    PEX_NOT_UNDER_WINE(pextest::kWineSetupApi);
     machine.WriteFile(kTarget, "old");
     machine.WriteFile("C:\\App\\Sub\\marker.txt", "x");
     plat::CFile running;

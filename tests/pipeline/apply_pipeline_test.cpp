@@ -13,6 +13,7 @@
 #include "platform/setup_install.h"
 #include "tests/pipeline/pipeline_fixture.h"
 #include "tests/rivzip/memory_streams.h"
+#include "tests/support/platform_guard.h"
 #include "tests/support/test_registry.h"
 
 namespace reg = plat::reg;
@@ -143,6 +144,7 @@ TEST_F(ApplyPipeline, MandatoryOnlyTakesForcedRowsThatCannotBeSnoozed) {
 }
 
 TEST_F(ApplyPipeline, ATargetInUseIsQueuedForTheRestart) {
+    PEX_NOT_UNDER_WINE(pextest::kWineSetupApi);
     machine.WriteFile("C:\\App\\busy.exe", "running version");
     Publish({Row("busy.exe", "next version")});
     {

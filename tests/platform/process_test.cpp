@@ -14,6 +14,7 @@
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "tests/support/environment.h"
+#include "tests/support/platform_guard.h"
 #include "tests/support/test_machine.h"
 
 namespace {
@@ -77,8 +78,11 @@ TEST(Process, ProgramsInTheCurrentFolderOnPathAndByFullPath) {
 
     EXPECT_EQ(RunToEnd(R"("C:\Program Files\Vantric Tool\run me.exe" exit 6)"), 6);
     // Unquoted, Windows tries the path at each blank until a program is found; the program
-    // then sees the rest of the line split at the blanks (an unknown command: 99).
-    EXPECT_EQ(RunToEnd(R"(C:\Program Files\Vantric Tool\run me.exe exit 6)"), 99);
+    // then sees the rest of the line split at the blanks (an unknown command: 99). Wine quotes
+    // the program's path in the line it hands over, so there the program sees "exit 6".
+    if (!pextest::UnderWine()) {
+        EXPECT_EQ(RunToEnd(R"(C:\Program Files\Vantric Tool\run me.exe exit 6)"), 99);
+    }
 }
 
 TEST(Process, CommandLineReachesTheProgramIntact) {

@@ -102,11 +102,12 @@ TEST_F(RegFileTest, ExportThenImportReproducesEveryTypeAndOddBytes) {
     EXPECT_EQ(std::string("1:\xE4\0", 4), Get(key + "\\Nested\\Deeper", "\xC4NAME"));
 }
 
+// Values are made in name order: Windows lists them in the order of creation, Wine by name.
 TEST_F(RegFileTest, ExportIsUtf16WithTheLayoutOfTheRegistryEditor) {
-    Set(kProducts, "Text", reg::kRegSz, std::string("C:\\x\0", 5));
-    Set(kProducts, "Mode", reg::kRegDword, std::string("\x02\0\0\0", 4));
-    Set(kProducts, "Env", reg::kRegExpandSz, std::string("%a%\0", 4));
     Set(kProducts, "Blob", reg::kRegBinary, std::string(30, '\xAB'));
+    Set(kProducts, "Env", reg::kRegExpandSz, std::string("%a%\0", 4));
+    Set(kProducts, "Mode", reg::kRegDword, std::string("\x02\0\0\0", 4));
+    Set(kProducts, "Text", reg::kRegSz, std::string("C:\\x\0", 5));
     Set(std::string(kProducts) + "\\Sub", "", reg::kRegNone, "");
     std::string file;
     ASSERT_EQ(0, reg::ExportRegFile(Path(kProducts), &file));
@@ -114,11 +115,11 @@ TEST_F(RegFileTest, ExportIsUtf16WithTheLayoutOfTheRegistryEditor) {
     std::string hexBlob = "\"Blob\"=hex:";
     for (int i = 0; i < 30; ++i) hexBlob += i == 0 ? "ab" : i == 22 ? ",\\\r\n  ab" : ",ab";
     EXPECT_EQ("Windows Registry Editor Version 5.00\r\n\r\n"
-              "[HKEY_LOCAL_MACHINE\\Software\\Vantric\\Pex]\r\n"
-              "\"Text\"=\"C:\\\\x\"\r\n"
-              "\"Mode\"=dword:00000002\r\n"
-              "\"Env\"=hex(2):25,00,61,00,25,00,00,00\r\n" +
-                  hexBlob + "\r\n\r\n"
+              "[HKEY_LOCAL_MACHINE\\Software\\Vantric\\Pex]\r\n" +
+                  hexBlob + "\r\n"
+                  "\"Env\"=hex(2):25,00,61,00,25,00,00,00\r\n"
+                  "\"Mode\"=dword:00000002\r\n"
+                  "\"Text\"=\"C:\\\\x\"\r\n\r\n"
                   "[HKEY_LOCAL_MACHINE\\Software\\Vantric\\Pex\\Sub]\r\n"
                   "@=hex(0):\r\n\r\n",
               reg::FromUtf16(file.substr(2)));
@@ -203,24 +204,25 @@ TEST_F(RegFileTest, VersionFourTextsAreSingleByteAndDeletionsApply) {
     EXPECT_FALSE(KeyExists("HKLM\\Software\\Gone"));
 }
 
+// Values are made in name order: Windows lists them in the order of creation, Wine by name.
 TEST_F(RegFileTest, QueryPrintsLikeTheWindowsCommand) {
     const std::string key = std::string(kProducts) + "\\Zendor32";
-    Set(key, "DefaultPath", reg::kRegSz, std::string("C:\\Program Files\\Vantric\0", 25));
     Set(key, "", reg::kRegSz, std::string("d\0", 2));
-    Set(key, "Mode", reg::kRegDword, std::string("\x1f\0\0\0", 4));
     Set(key, "Bytes", reg::kRegBinary, "\x0a\xbc");
+    Set(key, "DefaultPath", reg::kRegSz, std::string("C:\\Program Files\\Vantric\0", 25));
     Set(key, "List", reg::kRegMultiSz, std::string("a\0b\0\0", 5));
+    Set(key, "Mode", reg::kRegDword, std::string("\x1f\0\0\0", 4));
     Set(key + "\\Beta", "", reg::kRegNone, "");
     Set(key + "\\alpha", "Mode", reg::kRegExpandSz, std::string("%x%\0", 4));
 
     std::string out;
     ASSERT_EQ(0, reg::Query(Path("hklm\\Software\\Vantric\\Pex\\Zendor32"), {}, &out));
     EXPECT_EQ("\nHKEY_LOCAL_MACHINE\\Software\\Vantric\\Pex\\Zendor32\n"
-              "    DefaultPath    REG_SZ    C:\\Program Files\\Vantric\n"
               "    (Default)    REG_SZ    d\n"
-              "    Mode    REG_DWORD    0x1f\n"
               "    Bytes    REG_BINARY    0ABC\n"
+              "    DefaultPath    REG_SZ    C:\\Program Files\\Vantric\n"
               "    List    REG_MULTI_SZ    a\\0b\n"
+              "    Mode    REG_DWORD    0x1f\n"
               "\nHKEY_LOCAL_MACHINE\\Software\\Vantric\\Pex\\Zendor32\\alpha\n"
               "HKEY_LOCAL_MACHINE\\Software\\Vantric\\Pex\\Zendor32\\Beta\n",
               out);

@@ -10,6 +10,7 @@
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "platform/pe_resources.h"
+#include "tests/support/environment.h"
 #include "tests/support/test_machine.h"
 
 namespace {
@@ -58,7 +59,7 @@ TEST(VersionInfo, WindowsDllFixture) {
 TEST(VersionInfo, OurStampedProgramAndModules) {
     pextest::TestMachine m;
     VersionInfo host;
-    ASSERT_TRUE(plat::ver::Read(AppFolder() + "pexupdate", &host));
+    ASSERT_TRUE(plat::ver::Read(AppFolder() + pextest::ProgramFile("pexupdate"), &host));
     ASSERT_NE(host.Fixed(), nullptr);
     EXPECT_EQ(host.Fixed()->fileVersionMS, (PEX_VERSION_MAJOR << 16) | PEX_VERSION_MINOR);
     EXPECT_EQ(host.Fixed()->fileVersionLS, (PEX_VERSION_BUILD << 16) | PEX_VERSION_REVISION);
@@ -70,7 +71,7 @@ TEST(VersionInfo, OurStampedProgramAndModules) {
     EXPECT_EQ(StringOf(host, "\\StringFileInfo\\040904E4\\FileDescription"), "Vantric Update Host");
     EXPECT_EQ(StringOf(host, "\\StringFileInfo\\040904E4\\FileVersion"), PEX_VERSION_TEXT);
     EXPECT_EQ(StringOf(host, "\\StringFileInfo\\040904E4\\ProductVersion"), PEX_VERSION_TEXT);
-    EXPECT_EQ(StringOf(host, "\\StringFileInfo\\040904E4\\OriginalFilename"), "pexupdate");
+    EXPECT_EQ(StringOf(host, "\\StringFileInfo\\040904E4\\OriginalFilename"), pextest::ProgramFile("pexupdate"));
 
     VersionInfo selfReg, noSelfReg;
     ASSERT_TRUE(plat::ver::Read(AppFolder() + "PexSelfReg.dll", &selfReg));

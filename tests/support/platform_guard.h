@@ -22,4 +22,9 @@
 namespace pextest {
 // True when the program runs under Wine (it exports wine_get_version from ntdll).
 bool UnderWine();
+
+// Why the tests of a file in use at the restart cannot pass under Wine.
+constexpr const char* kWineSetupApi =
+    "its SetupInstallFileEx stages the file in the temporary folder, queues the rename without "
+    "replacing the target and does not report the target in use";
 }  // namespace pextest
