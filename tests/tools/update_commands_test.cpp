@@ -47,7 +47,6 @@ TEST(UpdateCommands, ScriptIsCheckedAndTriedOnARowWithoutChangingTheFile) {
 }
 
 TEST(UpdateCommands, AllAndProductRunTheLibraryAndExplainWhereTheLogIs) {
-    PEX_LINUX_ONLY();
     pextest::TestMachine machine;
     pextest::SetRegText(reg::kLocalMachine, "Software\\Vantric\\Pex\\Orlandel", "ContentFileName",
                         "C:\\Orlandel\\content.csv");
