@@ -1,12 +1,16 @@
 #include "fuzz/fuzz_machine.h"
 
+#include <signal.h>
 #include <stdlib.h>
+#include <unistd.h>
 
+#include <cerrno>
 #include <cstdio>
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
 #include <sstream>
+#include <string>
 
 #include "platform/machine.h"
 #include "platform/paths.h"
@@ -27,12 +31,31 @@ void RemoveRoot() {
     fs::remove_all(RootStore(), ec);
 }
 
+// libFuzzer ends a process that found something without running its exit handlers, so roots
+// are named after their process and the roots of processes that are gone are removed by the
+// next one.
+void RemoveRootsOfEndedProcesses(const fs::path& folder) {
+    std::error_code ec;
+    for (const fs::directory_entry& entry : fs::directory_iterator(folder, ec)) {
+        const std::string name = entry.path().filename().string();
+        if (name.rfind("pexfuzz-", 0) != 0) continue;
+        char* end = nullptr;
+        const long pid = std::strtol(name.c_str() + 8, &end, 10);
+        if (pid <= 0 || *end != '-') continue;
+        if (kill(static_cast<pid_t>(pid), 0) != 0 && errno == ESRCH) {
+            fs::remove_all(entry.path(), ec);
+        }
+    }
+}
+
 }  // namespace
 
 const std::string& UseFreshMachine() {
     std::string& root = RootStore();
     if (!root.empty()) return root;
-    std::string tmpl = (fs::temp_directory_path() / "pexfuzz-XXXXXX").string();
+    RemoveRootsOfEndedProcesses(fs::temp_directory_path());
+    const std::string name = "pexfuzz-" + std::to_string(getpid()) + "-XXXXXX";
+    std::string tmpl = (fs::temp_directory_path() / name).string();
     if (!mkdtemp(tmpl.data())) {
         std::perror("pexfuzz: cannot create a machine root");
         std::abort();

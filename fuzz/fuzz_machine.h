@@ -7,7 +7,8 @@
 namespace pexfuzz {
 
 // Creates the root on the first call (later calls return the same one) and removes it when the
-// process exits normally. The current directory is C:\ afterwards.
+// process exits normally; roots left by ended processes go at the next start. The current
+// directory is C:\ afterwards.
 const std::string& UseFreshMachine();
 
 // Writes a file into the machine by Windows path, creating its folders.
