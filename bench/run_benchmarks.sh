@@ -41,6 +41,7 @@ finished=$(date +%s)
 {
   echo "{"
   echo "  \"seconds\": $((finished - started)),"
+  echo "  \"build_seconds\": ${PEX_BENCH_BUILD_SECONDS:-0},"
   echo "  \"date\": \"$(date -u +%Y-%m-%dT%H:%MZ)\","
   echo "  \"load\": \"$(cut -d' ' -f1-3 /proc/loadavg)\","
   echo "  \"cpus\": $(nproc),"
