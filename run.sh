@@ -96,13 +96,13 @@ cmd_windows() {
   wineserver -p </dev/null >/dev/null 2>&1
   wine wineboot -i </dev/null >/dev/null 2>&1
   WINE_PASSED=0 WINE_SKIPPED=0 WINE_FAILED=0
-  local program failures=0
+  local program failures=0 started=$SECONDS
   while read -r program; do
     [ -n "$program" ] || continue
     run_wine_test "$program" || failures=$((failures + 1))
   done <"$WINDOWS_BUILD/wine-tests.txt"
   echo "Total under Wine: $WINE_PASSED passed, $WINE_SKIPPED skipped, $WINE_FAILED failed;" \
-       "$failures program(s) with failures"
+       "$failures program(s) with failures; $((SECONDS - started))s under Wine"
   ((failures == 0))
 }
 
