@@ -175,7 +175,8 @@ def content_section(results, docs, targets):
     if drawn:
         out += ["![content file](content_file.png)", ""]
     if small_save and small_noflush:
-        out += ["Reading: load, parse and render grow linearly (about n^1.0 from 10,000 to 100,000 rows). The durable "
+        out += ["Reading: load, parse and render grow linearly (about n^1.0 from 1,000 to 100,000 rows, the rest "
+                "being the caches, which the largest tables outgrow). The durable "
                 "save of a small table is almost all flushing: %s for 100 rows against %s without the flushes, so "
                 "its cost is flat until the bytes themselves matter (above about 10,000 rows)." %
                 (fmt_time(small_save), fmt_time(small_noflush)), ""]
