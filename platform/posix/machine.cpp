@@ -18,6 +18,8 @@
 namespace plat::paths::detail {
 // Defined beside the current directory (paths.cpp); a new machine starts at C:\ .
 void ResetCurrentDirectory();
+// The entry of a host folder named name without regard to ASCII case; empty when none.
+std::string ChildOfFolder(const std::string& dir, const std::string& name);
 }  // namespace plat::paths::detail
 
 namespace plat::machine {
@@ -71,17 +73,8 @@ bool MakeDir(const std::string& path) {
 // The entry of dir named name without regard to ASCII case, else name itself: an adopted
 // drive_c may spell its folders "Windows" or "SYSTEM32".
 std::string ChildNoCase(const std::string& dir, const std::string& name) {
-    DIR* d = opendir(dir.c_str());
-    if (!d) return name;
-    std::string found = name;
-    while (dirent* e = readdir(d)) {
-        if (strcasecmp(e->d_name, name.c_str()) == 0) {
-            found = e->d_name;
-            break;
-        }
-    }
-    closedir(d);
-    return found;
+    const std::string found = paths::detail::ChildOfFolder(dir, name);
+    return found.empty() ? name : found;
 }
 
 bool MakeLinkIfMissing(const std::string& link, const char* target) {

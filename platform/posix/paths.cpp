@@ -175,6 +175,8 @@ char DriveHolding(const std::string& root, const std::string& host, std::string*
 }  // namespace
 
 namespace detail {
+std::string ChildOfFolder(const std::string& dir, const std::string& name) { return MatchChild(dir, name); }
+
 void ResetCurrentDirectory() {
     std::lock_guard<std::mutex> hold(Lock());
     Current() = kInitialDirectory;
