@@ -1,7 +1,10 @@
 // CManifestParser: the apply pipeline: decompression, group application in dependency order with
 // bounded retries and group rollback, status recording in the content file, and cleanup.
+#include <cctype>
+#include <set>
 #include <vector>
 
+#include "decompress/expansion_record.h"
 #include "diag/trace_log.h"
 #include "manifest/manifest_parser.h"
 #include "model/upgrade_status.h"
@@ -21,6 +24,28 @@ void Step(ProgressCallback callback) {
     callback(&g_ProgressData);
 }
 
+std::string Upper(std::string text) {
+    for (char& c : text) c = static_cast<char>(std::toupper(static_cast<unsigned char>(c)));
+    return text;
+}
+
+// The expansion records (upper-cased paths) in the folders of the master list's downloads:
+// one listing per folder instead of a lookup per download, since a lookup of a name that is
+// missing, as nearly all records are, reads the whole folder on the emulated machine.
+std::set<std::string> ExpansionRecordsBeside(CMasterList& masterList) {
+    std::set<std::string> folders, records;
+    for (auto& [key, group] : masterList)
+        for (const CFile_& file : group.GetFiles()) {
+            const std::string& download = file.GetDownLoadCacheFile();
+            const std::size_t cut = download.find_last_of("\\/");
+            if (cut != std::string::npos) folders.insert(download.substr(0, cut + 1));
+        }
+    for (const std::string& folder : folders)
+        for (const plat::files::FindEntry& entry : plat::files::Find(ExpansionRecordName(folder + "*")))
+            records.insert(Upper(folder + entry.name));
+    return records;
+}
+
 }  // namespace
 
 std::int32_t CManifestParser::iProcessUpdateInformation(std::int32_t& result, ProgressCallback callback) {
@@ -37,6 +62,7 @@ void CManifestParser::DecompressFiles(std::int32_t& result, ProgressCallback cal
     TRACE(g_TraceLog, "CManifestParser:  Decompression step.....");
     TRACE(g_TraceLog, "%s", "");
     Report(callback, "Decompressing...");
+    const std::set<std::string> records = ExpansionRecordsBeside(masterList_);
     for (auto& [key, group] : masterList_) {
         TRACE(g_TraceLog, "%s", "");
         TRACE(g_TraceLog, "CManifestParser: Examining group '%s' for files needing decompressing...", key.c_str());
@@ -46,7 +72,13 @@ void CManifestParser::DecompressFiles(std::int32_t& result, ProgressCallback cal
                   file.IsDecompressionNeeded() ? 1 : 0);
             // The row says the download is expanded: a record left by a run that ended before
             // it could remove it (below) has done its work.
-            if (!file.IsDecompressionNeeded()) file.ExpansionRecorded();
+            if (!file.IsDecompressionNeeded()) {
+                if (records.count(Upper(ExpansionRecordName(file.GetDownLoadCacheFile())))) {
+                    file.ExpansionRecorded();
+                } else {
+                    file.NoExpansionRecord();
+                }
+            }
             if ((mandatoryOnly_ && !file.IsMandatory()) || !file.IsDecompressionNeeded()) continue;
             Report(callback, "Decompressing " + file.GetFileName());
             if (file.Decompress(callback)) {
@@ -180,16 +212,22 @@ void CManifestParser::CleanUp(std::int32_t result, ProgressCallback callback) {
     // fails) is found by the next run through the rows, which read as applied, and removed
     // there (RemoveLeftoversOfCommittedRows). Discarded first, nothing would name them again.
     bool cleaned = true;
+    std::set<std::uint32_t> cleanedRows;
     for (auto& [key, group] : masterList_) {
         for (CFile_& file : group.GetFiles()) {
             TRACE(g_TraceLog, "CManifestParser: ProcessUpdateInformation, removing backup file for '%s'",
                   file.GetFileName().c_str());
             const bool noBackup = file.RemoveBackupFile();
             // The download stays while a backup does: it is what proves the backup obsolete.
-            if (file.IsApplied()) cleaned = noBackup && file.ExpansionRecorded() && file.Remove() && cleaned;
+            if (!file.IsApplied()) continue;
+            if (noBackup && file.ExpansionRecorded() && file.Remove()) {
+                cleanedRows.insert(file.GetRow());
+            } else {
+                cleaned = false;
+            }
         }
     }
-    cleaned = RemoveLeftoversOfCommittedRows() && cleaned;
+    cleaned = RemoveLeftoversOfCommittedRows(cleanedRows) && cleaned;
     if (result != 0) return;
     if (!cleaned) {
         TRACE(g_TraceLog,
@@ -206,10 +244,12 @@ void CManifestParser::CleanUp(std::int32_t result, ProgressCallback callback) {
 
 // Rows that read as applied are not admitted, so nothing else would look at what the run that
 // applied them left behind when it ended before its clean-up. False when some of it is left.
-bool CManifestParser::RemoveLeftoversOfCommittedRows() {
+// The rows that this run has just cleaned up after are not looked at again.
+bool CManifestParser::RemoveLeftoversOfCommittedRows(const std::set<std::uint32_t>& cleanedRows) {
     bool removed = true;
     for (std::uint32_t row = 0; row < table_.RowCount(); ++row) {
-        if (table_.Field(row, "UpgradeStatus") != UpgradeStatus[kAppliedSuccessfully]) continue;
+        if (cleanedRows.count(row) || table_.Field(row, "UpgradeStatus") != UpgradeStatus[kAppliedSuccessfully])
+            continue;
         const std::string& download = table_.Field(row, "DownLoadCacheFile");
         if (download.empty() || !plat::files::Exists(download)) continue;
         CFile_ file(row, true, true, table_.Field(row, "HomeDir"), table_.Field(row, "FileName"), download,

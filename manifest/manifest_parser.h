@@ -86,7 +86,7 @@ private:
     void ApplyGroups(std::int32_t& result, ProgressCallback callback);
     void ApplyGroup(CFileGroup& group, std::int32_t& result, ProgressCallback callback);
     void CleanUp(std::int32_t result, ProgressCallback callback);
-    bool RemoveLeftoversOfCommittedRows();
+    bool RemoveLeftoversOfCommittedRows(const std::set<std::uint32_t>& cleanedRows);
 
     std::set<std::string> specialFiles_;
     bool specialFileAttempted_ = false;

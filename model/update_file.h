@@ -9,6 +9,7 @@
 #pragma once
 #include <cstdint>
 #include <string>
+#include <vector>
 
 #include "entry/progress_data.h"
 
@@ -29,6 +30,7 @@ public:
 
     std::uint32_t GetRow() const { return Row; }
     std::string GetFileName() const { return FileName; }
+    const std::string& GetDownLoadCacheFile() const { return DownLoadCacheFile; }
     bool IsDownloaded() const;
     bool IsApplied() const;
     bool IsDecompressionNeeded() const { return NeedsDecompression; }
@@ -43,7 +45,9 @@ public:
     // Called once the content file says that the download needs no decompressing: the record
     // by which a later run would recognise the expansion has done its work and is removed.
     // True when none is left.
-    bool ExpansionRecorded() const;
+    bool ExpansionRecorded();
+    // Tells the file that a listing of its download's folder found no expansion record.
+    void NoExpansionRecord() { ExpansionRecordGone = true; }
 
     // path + ".$bak$", with "x" appended until no file or folder has that name.
     std::string MakeBackupFileName(std::string path) const;
@@ -87,8 +91,10 @@ private:
     std::string TargetPath() const;
     std::int32_t Install();
     bool PreserveTarget(const std::string& target);
-    bool AdoptEarlierCopy(const std::string& target);
-    std::string ReusableBackup(const std::string& target) const;
+    static std::vector<std::string> ExistingBackups(const std::string& target);
+    bool AdoptEarlierCopy(const std::string& target, const std::vector<std::string>& backups);
+    std::string ReusableBackup(const std::string& target, const std::vector<std::string>& backups,
+                               bool* reused) const;
     void InstallThroughSetup(const std::string& target);
     std::int32_t RunCommands();
     bool Undo();
@@ -111,4 +117,7 @@ private:
     // was no target". So no later Apply backs the target up again (that would put this file's
     // own copy into the backup) and no RemoveBackupFile of an unapplied file deletes the backup.
     bool TargetReplaced = false;
+    // No expansion record of the download is left: ExpansionRecorded removed it or found none,
+    // and Decompress has not written one since.
+    bool ExpansionRecordGone = false;
 };

@@ -57,10 +57,14 @@ bool CFile_::PreserveTarget(const std::string& target) {
         }
         return true;
     }
-    if (BackupFileName.empty() && AdoptEarlierCopy(target)) return true;
-    // A retried group backs up into the name made the first time.
-    if (BackupFileName.empty()) BackupFileName = ReusableBackup(target);
-    ClearReadOnly(BackupFileName);  // a reused backup of a read-only target is read-only too
+    // A retried group backs up into the name made the first time, which may still hold a backup.
+    bool reused = true;
+    if (BackupFileName.empty()) {
+        const std::vector<std::string> backups = ExistingBackups(target);
+        if (AdoptEarlierCopy(target, backups)) return true;
+        BackupFileName = ReusableBackup(target, backups, &reused);
+    }
+    if (reused) ClearReadOnly(BackupFileName);  // a backup of a read-only target is read-only too
     if (!plat::files::Copy(target, BackupFileName, false)) {
         TRACE(g_TraceLog, "CFile_: Backup of file %s to %s failed, reason code is %d",
               FileName.c_str(), BackupFileName.c_str(), plat::LastError());

@@ -32,7 +32,10 @@ bool CFile_::Decompress(ProgressCallback callback) {
         }
     }
     const bool decompressed = decompressor->Decompress(CompressionType, DownLoadCacheFile, callback);
-    if (decompressed) NeedsDecompression = false;
+    if (decompressed) {
+        NeedsDecompression = false;
+        ExpansionRecordGone = false;  // the expansion wrote one
+    }
     TRACE(g_TraceLog, "CFile_::Decompress return value is %d", decompressed);
     return decompressed;
 }
@@ -42,4 +45,9 @@ void CFile_::UnloadDecompressor() {
     if (std::unique_ptr<CDecompressionObjects>& decompressor = SharedDecompressor()) decompressor->Unload();
 }
 
-bool CFile_::ExpansionRecorded() const { return DiscardExpansionRecord(DownLoadCacheFile); }
+// Asked again at the clean-up: a record already removed is not looked for again (a lookup of a
+// missing name reads the whole download folder on the emulated machine).
+bool CFile_::ExpansionRecorded() {
+    if (!ExpansionRecordGone) ExpansionRecordGone = DiscardExpansionRecord(DownLoadCacheFile);
+    return ExpansionRecordGone;
+}

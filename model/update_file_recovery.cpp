@@ -17,16 +17,6 @@
 
 namespace {
 
-// The backups that exist for a target, oldest first: target.$bak$, then each with one more
-// "x", up to the first name that is free (where MakeBackupFileName would put a new one).
-std::vector<std::string> ExistingBackups(const std::string& target) {
-    std::vector<std::string> backups;
-    plat::files::FileStatus status;
-    for (std::string name = target + ".$bak$"; plat::files::GetStatus(name, &status); name += "x")
-        backups.push_back(name);
-    return backups;
-}
-
 bool ReadBlock(plat::CFile& file, unsigned char* buffer, std::uint32_t size, std::uint32_t* got) {
     try {
         *got = file.Read(buffer, size);
@@ -56,14 +46,23 @@ bool SameBytes(const std::string& a, const std::string& b) {
 
 }  // namespace
 
+// The backups that exist for a target, oldest first: target.$bak$, then each with one more
+// "x", up to the first name that is free (where MakeBackupFileName would put a new one).
+std::vector<std::string> CFile_::ExistingBackups(const std::string& target) {
+    std::vector<std::string> backups;
+    plat::files::FileStatus status;
+    for (std::string name = target + ".$bak$"; plat::files::GetStatus(name, &status); name += "x")
+        backups.push_back(name);
+    return backups;
+}
+
 // The target already holds exactly the downloaded bytes while backups of it exist: an earlier
 // run backed the target up and copied this file over it, then ended before the content file
 // said so. The most recent backup holds the previous version; it becomes this file's backup,
 // as if this run had taken it, and the target (this file's own bytes) is not backed up over
 // it. A target that holds the new bytes with no backup beside it is backed up as usual: it
 // may have been that way before the update, so deleting it on rollback could lose it.
-bool CFile_::AdoptEarlierCopy(const std::string& target) {
-    const std::vector<std::string> backups = ExistingBackups(target);
+bool CFile_::AdoptEarlierCopy(const std::string& target, const std::vector<std::string>& backups) {
     if (backups.empty() || !SameBytes(target, DownLoadCacheFile)) return false;
     BackupFileName = backups.back();
     TargetReplaced = true;
@@ -76,9 +75,10 @@ bool CFile_::AdoptEarlierCopy(const std::string& target) {
 
 // Where to back the target up: a leftover backup that holds exactly the target's bytes (an
 // earlier run backed it up and ended before replacing it) is taken again rather than left
-// beside a new one; otherwise a new name.
-std::string CFile_::ReusableBackup(const std::string& target) const {
-    const std::vector<std::string> backups = ExistingBackups(target);
+// beside a new one (*reused); otherwise a new name.
+std::string CFile_::ReusableBackup(const std::string& target, const std::vector<std::string>& backups,
+                                   bool* reused) const {
+    *reused = true;
     for (auto it = backups.rbegin(); it != backups.rend(); ++it) {
         if (SameBytes(*it, target)) {
             TRACE(g_TraceLog, "CFile_: '%s' already holds the target as it is, left by an earlier run; reusing it",
@@ -86,7 +86,10 @@ std::string CFile_::ReusableBackup(const std::string& target) const {
             return *it;
         }
     }
-    return MakeBackupFileName(target);
+    *reused = false;
+    // With no backup at all the first name was just found free; asking again would read the
+    // whole folder once more on the emulated machine.
+    return backups.empty() ? target + ".$bak$" : MakeBackupFileName(target);
 }
 
 bool CFile_::RemoveLeftovers() {

@@ -75,8 +75,10 @@ std::string ModuleFileName(const void* addressInModule);
 
 // Whole-file helpers for the system's own files (content file, logs).
 bool ReadAll(const std::string& path, std::string* bytes);
-// Writes durably: temporary file beside the target, flush, rename over it, flush the folder.
-// On failure the old file stays as it was.
+// Writes durably: the new bytes are flushed to the disk before they take the file's name, in one
+// step, so the file holds its old or its new content at every moment, also after a power cut.
+// On failure the old file stays as it was. (The emulation keeps the previous version hidden
+// beside the file to write the next one into; Remove removes it with the file.)
 bool WriteAllDurably(const std::string& path, const std::string& bytes);
 
 }  // namespace plat::files

@@ -157,23 +157,64 @@ bool CopyContent(int from, int to) {
     }
 }
 
-bool SyncFolder(const std::string& folder) {
-    const int fd = open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
-    if (fd < 0) return false;
-    const bool ok = fsync(fd) == 0;
-    close(fd);
-    return ok;
-}
-
 // How a replacement file is finished before it takes the target's name.
 struct Finish {
     mode_t mode = 0644;
     const struct timespec* times = nullptr;  // access and write time to keep, or none
-    bool syncFolder = false;
     // The step that puts the new bytes in place is a rename of its own for the fault plan, so a
     // plan can stop a whole-file write after the data is flushed but before the target changes.
     bool renameStep = false;
+    // Keep the replaced version as the target's spare (see SpareOf) instead of deleting it.
+    bool keepSpare = false;
 };
+
+// A file that is rewritten again and again (the content file, after every group of a run)
+// keeps its previous version under this hidden name, and the next version is written into it
+// and then exchanged with the file. Writing each version into a new file and renaming it over
+// the old one would free a file per write instead, and a file system without a journal
+// searches past every file freed in the last minutes whenever it creates one: a run of N
+// groups would cost N squared.
+std::string SpareOf(const std::string& host) {
+    return Parent(host) + "/.pex~" + BaseName(host).substr(0, 64) + ".prev";
+}
+
+// Opens the spare of host for writing; -1 when there is none that may be reused (it must be a
+// plain file with no other name that nobody holds). It is written over from its start and then
+// cut to the new length: emptying it first would free its blocks only to take them again.
+int OpenSpare(const std::string& host) {
+    const int fd = open(SpareOf(host).c_str(), O_WRONLY | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC);
+    if (fd < 0) return -1;
+    struct stat st;
+    if (fstat(fd, &st) != 0 || !S_ISREG(st.st_mode) || st.st_nlink != 1 || flock(fd, LOCK_EX | LOCK_NB) != 0) {
+        close(fd);
+        return -1;
+    }
+    return fd;
+}
+
+// Fills fd, gives it the finished mode and times and flushes it to the disk; closes fd. On
+// failure *err is the cause.
+bool FillAndFlush(int fd, const std::function<bool(int)>& fill, const Finish& finish, int* err) {
+    bool ok = fill(fd) && fchmod(fd, finish.mode & 07777) == 0 &&
+              (!finish.times || futimens(fd, finish.times) == 0) && fsync(fd) == 0;
+    *err = errno;
+    if (close(fd) != 0 && ok) {
+        ok = false;
+        *err = errno;
+    }
+    return ok;
+}
+
+// Puts the flushed file at from in target's place in one step. With keepSpare the two names
+// are exchanged and the replaced version becomes target's spare; where the file system cannot
+// exchange names, or target does not exist yet, it is a plain rename.
+bool TakeTargetName(const std::string& from, const std::string& target, bool keepSpare) {
+    if (keepSpare && renameat2(AT_FDCWD, from.c_str(), AT_FDCWD, target.c_str(), RENAME_EXCHANGE) == 0) {
+        if (rename(from.c_str(), SpareOf(target).c_str()) != 0) unlink(from.c_str());
+        return true;
+    }
+    return rename(from.c_str(), target.c_str()) == 0;
+}
 
 // Fills a temporary file beside target, flushes it to the disk and renames it over target, so
 // that target holds either its old or its new content at every moment. The temporary file
@@ -184,18 +225,13 @@ bool ReplaceAtomically(const std::string& target, const std::function<bool(int)>
     std::string temp = Parent(target) + "/.pex~" + BaseName(target).substr(0, 64) + ".XXXXXX";
     const int fd = mkostemp(temp.data(), O_CLOEXEC);
     if (fd < 0) return FailErrno(target);
-    bool ok = fill(fd) && fchmod(fd, finish.mode & 07777) == 0 &&
-              (!finish.times || futimens(fd, finish.times) == 0) && fsync(fd) == 0;
-    int err = errno;
-    if (close(fd) != 0 && ok) {
-        ok = false;
-        err = errno;
-    }
+    int err = 0;
+    bool ok = FillAndFlush(fd, fill, finish, &err);
     if (ok && finish.renameStep && !fault::Allow(fault::Op::Rename)) {
         unlink(temp.c_str());
         return false;
     }
-    if (ok && rename(temp.c_str(), target.c_str()) != 0) {
+    if (ok && !TakeTargetName(temp, target, finish.keepSpare)) {
         ok = false;
         err = errno;
     }
@@ -203,8 +239,27 @@ bool ReplaceAtomically(const std::string& target, const std::function<bool(int)>
         unlink(temp.c_str());
         return Fail(CodeFor(err, target));
     }
-    if (finish.syncFolder) SyncFolder(Parent(target));
     return true;
+}
+
+// ReplaceAtomically through target's spare, open as fd: no file is created or freed.
+bool ReplaceThroughSpare(const std::string& target, int fd, const std::function<bool(int)>& fill,
+                         const Finish& finish) {
+    auto fillAndCut = [&fill](int out) {
+        if (!fill(out)) return false;
+        const off_t length = lseek(out, 0, SEEK_CUR);
+        return length >= 0 && ftruncate(out, length) == 0;
+    };
+    int err = 0;
+    bool ok = FillAndFlush(fd, fillAndCut, finish, &err);
+    if (ok && finish.renameStep && !fault::Allow(fault::Op::Rename)) return false;
+    const std::string spare = SpareOf(target);
+    if (ok && renameat2(AT_FDCWD, spare.c_str(), AT_FDCWD, target.c_str(), RENAME_EXCHANGE) != 0) {
+        ok = false;
+        err = errno;
+    }
+    // Whatever failed, target is untouched and the spare holds nothing anybody needs.
+    return ok || Fail(CodeFor(err, target));
 }
 
 // Checks the target of a copy or write: its folder exists, and an existing file may be
@@ -320,6 +375,7 @@ bool Remove(const std::string& path) {
     if (lstat(host.c_str(), &st) != 0) return FailErrno(host);
     if (!S_ISLNK(st.st_mode) && !MayReplace(host, st)) return false;
     if (unlink(host.c_str()) != 0) return FailErrno(host);
+    unlink(SpareOf(host).c_str());  // the previous version of a file that WriteAllDurably kept
     return true;
 }
 
@@ -523,10 +579,12 @@ bool WriteAllDurably(const std::string& path, const std::string& bytes) {
     if (!CheckTarget(host, false, &exists, &st)) return false;
     Finish finish;
     if (exists) finish.mode = st.st_mode;
-    finish.syncFolder = true;
     finish.renameStep = true;
-    return ReplaceAtomically(
-        host, [&bytes](int fd) { return WriteFully(fd, bytes.data(), bytes.size()); }, finish);
+    finish.keepSpare = true;
+    auto fill = [&bytes](int fd) { return WriteFully(fd, bytes.data(), bytes.size()); };
+    const int spare = exists ? OpenSpare(host) : -1;
+    if (spare >= 0) return ReplaceThroughSpare(host, spare, fill, finish);
+    return ReplaceAtomically(host, fill, finish);
 }
 
 }  // namespace plat::files
