@@ -174,6 +174,7 @@ const std::string& CContentTable::Cell(std::uint32_t row, std::uint32_t column) 
 bool CContentTable::SetCell(std::uint32_t row, std::uint32_t column, const std::string& value) {
     if (column >= columnCount_ || row >= RowCount()) return false;
     cells_[static_cast<std::size_t>(row) * columnCount_ + column] = value;
+    if (row < rowText_.size()) rowText_[row].clear();
     return true;
 }
 
@@ -192,6 +193,7 @@ void CContentTable::Clear() {
     columns_.clear();
     cells_.clear();
     columnCount_ = 0;
+    rowText_.clear();
 }
 
 namespace {
@@ -226,17 +228,23 @@ void AppendPadded(std::string& out, const std::string& text, std::size_t width) 
 }  // namespace
 
 std::string CContentTable::Render(bool header, char separator) const {
+    if (separator != rowSeparator_) rowText_.clear();
+    rowSeparator_ = separator;
+    rowText_.resize(RowCount());
     std::size_t total = 2;
     for (const std::string& name : columns_) total += name.size() + 1;
-    for (const std::string& cell : cells_) total += cell.size() + 1;
-    total += 2 * static_cast<std::size_t>(RowCount());
+    for (std::uint32_t row = 0; row < RowCount(); ++row) {
+        // A rendered row is never empty: it ends in CR LF.
+        if (rowText_[row].empty()) {
+            AppendLine(rowText_[row], &cells_[static_cast<std::size_t>(row) * columnCount_], columnCount_,
+                       separator);
+        }
+        total += rowText_[row].size();
+    }
     std::string out;
     out.reserve(total);
     if (header) AppendLine(out, columns_.data(), columns_.size(), separator);
-    for (std::uint32_t row = 0; row < RowCount(); ++row) {
-        AppendLine(out, &cells_[static_cast<std::size_t>(row) * columnCount_], columnCount_,
-                   separator);
-    }
+    for (const std::string& text : rowText_) out += text;
     return out;
 }
 

@@ -74,4 +74,9 @@ private:
     std::vector<std::string> columns_;
     std::uint32_t columnCount_ = 0;
     std::vector<std::string> cells_;
+    // Each row as it was last rendered (empty until it is, or once a cell of it changes), with
+    // the separator used: the pipeline saves the table after every group and changes only that
+    // group's rows in between, so most rows are rendered once per run instead of once per save.
+    mutable std::vector<std::string> rowText_;
+    mutable char rowSeparator_ = 0;
 };

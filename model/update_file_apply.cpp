@@ -65,7 +65,7 @@ bool CFile_::PreserveTarget(const std::string& target) {
         BackupFileName = ReusableBackup(target, backups, &reused);
     }
     if (reused) ClearReadOnly(BackupFileName);  // a backup of a read-only target is read-only too
-    if (!plat::files::Copy(target, BackupFileName, false)) {
+    if (!plat::files::CopyToKeep(target, BackupFileName)) {
         TRACE(g_TraceLog, "CFile_: Backup of file %s to %s failed, reason code is %d",
               FileName.c_str(), BackupFileName.c_str(), plat::LastError());
         return false;

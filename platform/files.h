@@ -25,6 +25,13 @@ using FileTime = std::uint64_t;
 // source's last-write time is kept.
 bool Copy(const std::string& src, const std::string& dst, bool failIfExists);
 
+// Copy (overwriting) for a copy to keep, such as the backup of a file about to be replaced:
+// neither dst nor src is written to in place afterwards, only replaced whole (as Copy, Rename
+// and WriteAllDurably do) or deleted. The emulated machine then gives dst the very file that src
+// names, a second name for it (when nobody holds src and dst is free), which copies no bytes
+// and takes no new file; flushed so that the name survives a power cut. Windows copies.
+bool CopyToKeep(const std::string& src, const std::string& dst);
+
 // Renames (moves) a file, replacing an existing target when replace is set.
 bool Rename(const std::string& from, const std::string& to, bool replace);
 

@@ -323,8 +323,10 @@ std::string SelfExecutable() {
 
 }  // namespace
 
-bool Copy(const std::string& src, const std::string& dst, bool failIfExists) {
-    if (!fault::Allow(fault::Op::Copy)) return false;
+namespace {
+
+// Copy after the fault plan allowed it.
+bool CopyAllowed(const std::string& src, const std::string& dst, bool failIfExists) {
     std::string from, to;
     if (!HostOf(src, &from) || !HostOf(dst, &to)) return false;
     struct stat srcStat, dstStat;
@@ -346,6 +348,47 @@ bool Copy(const std::string& src, const std::string& dst, bool failIfExists) {
     }
     close(in);
     return ok;
+}
+
+// CopyToKeep by a second name for the file: only for a plain file that nobody holds, to a name
+// that is free, in the same file system. Returns false, having changed nothing, when it cannot.
+bool LinkToKeep(const std::string& from, const std::string& to) {
+    struct stat st;
+    if (lstat(from.c_str(), &st) != 0 || !S_ISREG(st.st_mode) || InUse(from)) return false;
+    if (link(from.c_str(), to.c_str()) != 0) return false;
+    // The new name must be on the disk before the caller replaces the source: without a journal
+    // nothing else orders the two.
+    const int folder = open(Parent(to).c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+    const bool durable = folder >= 0 && fsync(folder) == 0;
+    if (folder >= 0) close(folder);
+    if (!durable) unlink(to.c_str());
+    return durable;
+}
+
+}  // namespace
+
+bool Copy(const std::string& src, const std::string& dst, bool failIfExists) {
+    if (!fault::Allow(fault::Op::Copy)) return false;
+    return CopyAllowed(src, dst, failIfExists);
+}
+
+bool CopyToKeep(const std::string& src, const std::string& dst) {
+    if (!fault::Allow(fault::Op::Copy)) return false;
+    std::string from, to;
+    if (!HostOf(src, &from) || !HostOf(dst, &to)) return false;
+    // The refusals of a copy come first: a source held exclusively cannot be read.
+    struct stat st;
+    if (!StatOf(from, &st)) return false;
+    if (S_ISDIR(st.st_mode)) return Fail(kErrorAccessDenied);
+    if (LockedByOther(from, LOCK_SH)) return Fail(kErrorSharingViolation);
+    struct stat kept;
+    if (lstat(to.c_str(), &kept) == 0) {
+        // Already that very file (an earlier attempt kept it so, and it has not been replaced).
+        if (kept.st_ino == st.st_ino && kept.st_dev == st.st_dev) return true;
+    } else if (errno == ENOENT && LinkToKeep(from, to)) {
+        return true;
+    }
+    return CopyAllowed(src, dst, false);
 }
 
 bool Rename(const std::string& from, const std::string& to, bool replace) {

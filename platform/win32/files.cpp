@@ -101,6 +101,8 @@ bool Copy(const std::string& src, const std::string& dst, bool failIfExists) {
     return ::CopyFileA(src.c_str(), dst.c_str(), failIfExists ? TRUE : FALSE) != FALSE;
 }
 
+bool CopyToKeep(const std::string& src, const std::string& dst) { return Copy(src, dst, false); }
+
 bool Rename(const std::string& from, const std::string& to, bool replace) {
     if (!fault::Allow(fault::Op::Rename)) return false;
     if (replace && !MayReplace(to)) return false;

@@ -104,6 +104,34 @@ TEST_F(Files, AFileLockedByAnotherOpenerIsInUse) {
 #endif
 }
 
+// A copy to keep holds the source's bytes after the source is replaced, whether the emulation
+// made it a second name for the file or copied it, and asking again is harmless.
+TEST_F(Files, ACopyToKeepOutlivesTheReplacedSource) {
+    ASSERT_TRUE(files::CopyToKeep("C:\\app\\dst.txt", "C:\\app\\dst.txt.$bak$"));
+    ASSERT_TRUE(files::CopyToKeep("C:\\app\\dst.txt", "C:\\app\\dst.txt.$bak$"));
+    ASSERT_TRUE(files::Copy("C:\\app\\src.txt", "C:\\app\\dst.txt", false));
+    EXPECT_EQ(m.ReadFile("C:\\app\\dst.txt"), "new content");
+    EXPECT_EQ(m.ReadFile("C:\\app\\dst.txt.$bak$"), "old content");
+    // Over an existing file it is a copy like any other.
+    ASSERT_TRUE(files::CopyToKeep("C:\\app\\dst.txt", "C:\\app\\dst.txt.$bak$"));
+    EXPECT_EQ(m.ReadFile("C:\\app\\dst.txt.$bak$"), "new content");
+    ExpectFails(files::CopyToKeep("C:\\app\\none.txt", "C:\\app\\none.$bak$"), plat::kErrorFileNotFound);
+}
+
+// A source that somebody holds is copied, so that the copy is not held too and can be deleted.
+TEST_F(Files, ACopyToKeepOfAFileInUseIsARealCopy) {
+    PEX_LINUX_ONLY();
+#ifndef _WIN32
+    const int fd = open(plat::paths::ToHost("C:\\app\\dst.txt").c_str(), O_RDONLY);
+    ASSERT_EQ(flock(fd, LOCK_SH), 0);
+    ASSERT_TRUE(files::CopyToKeep("C:\\app\\dst.txt", "C:\\app\\kept.txt"));
+    EXPECT_TRUE(files::Remove("C:\\app\\kept.txt"));
+    ASSERT_EQ(flock(fd, LOCK_EX), 0);
+    ExpectFails(files::CopyToKeep("C:\\app\\dst.txt", "C:\\app\\kept.txt"), plat::kErrorSharingViolation);
+    close(fd);
+#endif
+}
+
 TEST_F(Files, ARunningProgramIsInUse) {
     PEX_LINUX_ONLY();
 #ifndef _WIN32
