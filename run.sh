@@ -4,8 +4,7 @@
 #   ./run.sh demo   install what is missing, build, update the products of the demo machine
 #   ./run.sh fuzz [SECONDS]   build the fuzz targets with clang and run each for SECONDS (not in CI)
 #   ./run.sh bench  build with optimisation into build-bench/, run every benchmark, write
-#                   docs/performance.md and its plots (not in CI; over 20 minutes on 2 cores,
-#                   10 to 11 with PEX_BENCH_QUICK=1, which leaves out the two largest runs)
+#                   docs/performance.md and its plots (not in CI; about 7 minutes on 2 cores)
 #   ./run.sh windows   install mingw-w64 and Wine, cross-build for Windows x64 into build-win/,
 #                      run every test program under Wine in a throw-away prefix
 # Both are idempotent and quick when nothing changed.

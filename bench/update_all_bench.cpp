@@ -27,6 +27,7 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <chrono>
 #include <cstdio>
 #include <filesystem>
@@ -245,6 +246,18 @@ void ForgetLogs(const std::string& bin) {
     fs::remove(bin + "/log/pex_support_mendler.bak", ec);
 }
 
+// The lines of the log that the last run left (0 without one).
+double LogLines(const std::string& bin) {
+    const int fd = ::open((bin + "/log/pex_support_mendler.log").c_str(), O_RDONLY | O_CLOEXEC);
+    if (fd < 0) return 0;
+    double lines = 0;
+    char buffer[1 << 16];
+    for (ssize_t n; (n = ::read(fd, buffer, sizeof buffer)) > 0;)
+        lines += static_cast<double>(std::count(buffer, buffer + n, '\n'));
+    ::close(fd);
+    return lines;
+}
+
 // A complete success: the content file is gone and the targets hold their new bytes.
 bool Installed(const Machine& m, const Scenario& s) {
     const int files = s.files;
@@ -268,6 +281,7 @@ void BM_UpdateAll(benchmark::State& state, Scenario scenario) {
     const std::string bin = BinFolder();
     const std::string host = scenario.logFile ? bin : NoLogBinFolder(bin);
     Timing mendler, floor;
+    double lines = 0;
     for (auto _ : state) {
         {
             Machine m(scenario);
@@ -277,6 +291,7 @@ void BM_UpdateAll(benchmark::State& state, Scenario scenario) {
                 state.SkipWithError("the update run failed");
                 break;
             }
+            lines = scenario.logFile ? LogLines(bin) : 0;
         }
         {
             Machine m(scenario);
@@ -294,6 +309,7 @@ void BM_UpdateAll(benchmark::State& state, Scenario scenario) {
     state.counters["floor_cpu_s"] = floor.cpu;
     state.counters["ratio"] = floor.seconds > 0 ? mendler.seconds / floor.seconds : 0;
     state.counters["files"] = scenario.files;
+    state.counters["log_lines"] = lines;
     state.counters["bytes"] = static_cast<double>(scenario.size) * scenario.files;
 }
 
@@ -319,8 +335,8 @@ int main(int argc, char** argv) {
     const auto each = Scenario::kOneGroupEach, one = Scenario::kOneGroup, chain = Scenario::kChain;
     Scenario noLog{1000, 64u << 10, each};
     noLog.logFile = false;
-    Register("small", {1000, 64u << 10, each}, 3);
-    Register("small-nolog", noLog, 3);
+    Register("small", {1000, 64u << 10, each}, 5);
+    Register("small-nolog", noLog, 5);
     Register("small-grouped", {1000, 64u << 10, Scenario::kGroupsOf100}, 3);
     Register("small-one", {1000, 64u << 10, one}, 3);
     Register("large", {8, 64u << 20, each, 0}, 3);
