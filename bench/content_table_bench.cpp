@@ -54,16 +54,23 @@ void BM_LoadFromFile(benchmark::State& state) {
 // The table keeps each row's text until a cell of it changes. A full render is timed on a fresh
 // copy of the loaded table (copied outside the timing); the pipeline's own case, a save after a
 // group changed its rows, is the render after one row changed.
-void BM_ToFileText(benchmark::State& state) {
+// Times what fn does with a fresh copy of a loaded table of state.range(0) rows, every row
+// still to be rendered.
+template <typename Fn>
+void OnFreshTable(benchmark::State& state, Fn fn) {
     CContentTable loaded, table;
     loaded.LoadFromText(MakeContentFile(static_cast<int>(state.range(0))));
     for (auto _ : state) {
         state.PauseTiming();
         table = loaded;
         state.ResumeTiming();
-        benchmark::DoNotOptimize(table.ToFileText());
+        fn(table);
     }
     state.SetComplexityN(state.range(0));
+}
+
+void BM_ToFileText(benchmark::State& state) {
+    OnFreshTable(state, [](CContentTable& table) { benchmark::DoNotOptimize(table.ToFileText()); });
 }
 
 void BM_ToFileTextOneRowChanged(benchmark::State& state) {
@@ -82,35 +89,21 @@ void BM_ToFileTextOneRowChanged(benchmark::State& state) {
 // Includes the flush of the durable save, which dominates for small tables; every row rendered.
 void BM_SaveToFile(benchmark::State& state) {
     pexbench::Machine();
-    CContentTable loaded, table;
-    loaded.LoadFromText(MakeContentFile(static_cast<int>(state.range(0))));
-    for (auto _ : state) {
-        state.PauseTiming();
-        table = loaded;
-        state.ResumeTiming();
-        benchmark::DoNotOptimize(table.SaveToFile(kPath));
-    }
-    state.SetComplexityN(state.range(0));
+    OnFreshTable(state, [](CContentTable& table) { benchmark::DoNotOptimize(table.SaveToFile(kPath)); });
 }
 
 // The same bytes replaced the same way (temporary file beside, rename) without the flush, every
 // row rendered: what the durable save costs beyond this is the flush.
 void BM_SaveWithoutFlush(benchmark::State& state) {
     pexbench::Machine();
-    CContentTable loaded, table;
-    loaded.LoadFromText(MakeContentFile(static_cast<int>(state.range(0))));
     const std::string host = plat::paths::ToHost(kPath), temp = host + ".tmp";
-    for (auto _ : state) {
-        state.PauseTiming();
-        table = loaded;
-        state.ResumeTiming();
+    OnFreshTable(state, [&](CContentTable& table) {
         const std::string bytes = table.ToFileText();
         const int fd = ::open(temp.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0644);
         const bool ok = fd >= 0 && ::write(fd, bytes.data(), bytes.size()) == static_cast<ssize_t>(bytes.size());
         if (fd >= 0) ::close(fd);
         if (!ok || std::rename(temp.c_str(), host.c_str()) != 0) state.SkipWithError("cannot write the file");
-    }
-    state.SetComplexityN(state.range(0));
+    });
 }
 
 }  // namespace
