@@ -38,8 +38,14 @@ private:
     }
 };
 
-TEST(CommandString, EveryTagReachesItsExecutorWithTheTrimmedParameter) {
+class CommandStringTest : public ::testing::Test {
+protected:
+    pextest::TestMachine m;
+    pextest::TraceCapture trace;
     RecordingCommands commands;
+};
+
+TEST_F(CommandStringTest, EveryTagReachesItsExecutorWithTheTrimmedParameter) {
     EXPECT_TRUE(commands.Execute(
         "[RUN] a b ;[DEL]\tb;[DELIFEXISTS]c;[REGSVR] d;[REGISTRY] e;"
         "[try-run]f;[Try-Del]g;[TRY-DELIFEXISTS]h;[TRY-REGSVR]i;[TRY-REGISTRY]j;[RUN];"
@@ -50,11 +56,11 @@ TEST(CommandString, EveryTagReachesItsExecutorWithTheTrimmedParameter) {
                      "DelIfExists(h)", "RegSvr(i)", "Registry(j)", "Run()", "Del(IFEXISTS] m)"}));
 }
 
-TEST(CommandString, TracesEveryItemAndSkipsUnknownOnesSilently) {
-    pextest::TestMachine m;
-    pextest::TraceCapture trace;
-    RecordingCommands commands;
+// Unknown items are skipped silently; TRY- commands let the list go on, but the result is false.
+TEST_F(CommandStringTest, TracesEveryItemAndTryCommandsContinue) {
     EXPECT_TRUE(commands.Execute("[run] one;; [NOPE] two ; \n"));
+    EXPECT_FALSE(commands.Execute("[TRY-REGSVR] text;[try-del] file;[DEL] next"));
+    EXPECT_EQ(commands.calls, (Lines{"Run(one)", "RegSvr(text)", "Del(file)", "Del(next)"}));
     EXPECT_EQ(trace.Lines(), (Lines{
         "CommandString::Execute 3 items in command list",
         "CommandString::Execute, command is [run] one",
@@ -62,16 +68,6 @@ TEST(CommandString, TracesEveryItemAndSkipsUnknownOnesSilently) {
         "CommandString::Execute, command is ",
         "CommandString::Execute, command is [NOPE] two",
         "CommandString::Execute returning 1",
-    }));
-}
-
-TEST(CommandString, TryCommandsContinueButTheResultIsFalse) {
-    pextest::TestMachine m;
-    pextest::TraceCapture trace;
-    RecordingCommands commands;
-    EXPECT_FALSE(commands.Execute("[TRY-REGSVR] text;[try-del] file;[DEL] next"));
-    EXPECT_EQ(commands.calls, (Lines{"RegSvr(text)", "Del(file)", "Del(next)"}));
-    EXPECT_EQ(trace.Lines(), (Lines{
         "CommandString::Execute 3 items in command list",
         "CommandString::Execute, command is [TRY-REGSVR] text",
         "Ignoring Exception [boom] from Command [[TRY-REGSVR]].",
@@ -83,28 +79,17 @@ TEST(CommandString, TryCommandsContinueButTheResultIsFalse) {
     }));
 }
 
-TEST(CommandString, AFailingCommandWithoutTryStopsTheListAndRethrows) {
-    {
-        pextest::TestMachine m;
-        pextest::TraceCapture trace;
-        RecordingCommands commands;
-        try {
-            commands.Execute("[REGISTRY] text;[RUN] never");
-            FAIL() << "no exception";
-        } catch (const char* message) {
-            EXPECT_EQ(message, RecordingCommands::kMessage);  // the same object, not a copy
-        }
-        EXPECT_EQ(commands.calls, (Lines{"Registry(text)"}));
-        EXPECT_EQ(trace.Lines().back(), "Throwing Exception [boom] from Command [[REGISTRY]].");
+TEST_F(CommandStringTest, AFailingCommandWithoutTryStopsTheListAndRethrows) {
+    try {
+        commands.Execute("[REGISTRY] text;[RUN] never");
+        FAIL() << "no exception";
+    } catch (const char* message) {
+        EXPECT_EQ(message, RecordingCommands::kMessage);  // the same object, not a copy
     }
-    {
-        pextest::TestMachine m;
-        pextest::TraceCapture trace;
-        RecordingCommands commands;
-        EXPECT_THROW(commands.Execute("[delifexists] file;[RUN] never"), plat::CFileException);
-        EXPECT_EQ(commands.calls, (Lines{"DelIfExists(file)"}));
-        EXPECT_EQ(trace.Lines().back(), "Throwing unknown Exception from Command [[DELIFEXISTS]].");
-    }
+    EXPECT_EQ(trace.Lines().back(), "Throwing Exception [boom] from Command [[REGISTRY]].");
+    EXPECT_THROW(commands.Execute("[delifexists] file;[RUN] never"), plat::CFileException);
+    EXPECT_EQ(commands.calls, (Lines{"Registry(text)", "DelIfExists(file)"}));
+    EXPECT_EQ(trace.Lines().back(), "Throwing unknown Exception from Command [[DELIFEXISTS]].");
 }
 
 }  // namespace

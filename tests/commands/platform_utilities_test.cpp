@@ -1,5 +1,5 @@
-// The shared utilities: product profile, process start, versions, registry texts, paths,
-// temporary names, directory trees and numbers.
+// The shared utilities: product profile, versions, registry texts, paths, temporary names,
+// directory trees and numbers. RunProcess is command_executors_test's, through [RUN].
 #include <gtest/gtest.h>
 
 #include "commands/platform_utilities.h"
@@ -20,72 +20,45 @@ protected:
     pextest::TestMachine machine;
 };
 
+// Reading and deleting entries are also the manifest's tests, through the product settings.
 TEST_F(UtilitiesTest, ProfileReadsWritesAndDeletesEntries) {
     CProfile profile;
     EXPECT_EQ(profile.ReadProfileEntry("Orlandel", "Site", "none"), "none");
-    EXPECT_TRUE(pextest::RegKeyExists(reg::kLocalMachine, std::string(kPex) + "\\Orlandel"));
+    EXPECT_TRUE(pextest::RegKeyExists(reg::kLocalMachine, std::string(kPex) + "\\Orlandel"));  // made by the read
     EXPECT_FALSE(profile.WriteProfileEntry("Orlandel", nullptr, "x"));
-    EXPECT_TRUE(profile.WriteProfileEntry("Orlandel", "Site", "server1/pub"));
-    EXPECT_EQ(profile.ReadProfileEntry("Orlandel", "Site", ""), "server1/pub");
+    EXPECT_TRUE(profile.WriteProfileEntry("", "Site", "server1/pub"));  // "": the products key itself
     std::string bytes;
-    ASSERT_TRUE(pextest::GetRegValue(reg::kLocalMachine, std::string(kPex) + "\\Orlandel", "Site", &bytes));
+    ASSERT_TRUE(pextest::GetRegValue(reg::kLocalMachine, kPex, "Site", &bytes));
     EXPECT_EQ(bytes, std::string("server1/pub", 12));  // stored with its terminating zero
-    EXPECT_TRUE(profile.WriteProfileEntry("Orlandel", "Site", nullptr));
-    EXPECT_FALSE(profile.WriteProfileEntry("Orlandel", "Site", nullptr));
-    EXPECT_EQ(profile.ReadProfileEntry("Orlandel", "Site", "gone"), "gone");
-    // The empty section is the products key itself.
-    EXPECT_TRUE(profile.WriteProfileEntry("", "DefaultPath", "C:\\Suite"));
-    EXPECT_EQ(profile.ReadProfileEntry("", "DefaultPath", "."), "C:\\Suite");
+    EXPECT_EQ(profile.ReadProfileEntry("", "Site", ""), "server1/pub");
+    EXPECT_TRUE(profile.WriteProfileEntry("", "Site", nullptr));
+    EXPECT_FALSE(profile.WriteProfileEntry("", "Site", nullptr));
+    EXPECT_EQ(profile.ReadProfileEntry("", "Site", "gone"), "gone");
 }
 
-TEST_F(UtilitiesTest, RunProcessWaitsOrGivesUp) {
-    EXPECT_TRUE(RunProcess("pextestprog exit 5", "C:\\", true, kInfinite, true));  // exit code ignored
-    EXPECT_TRUE(RunProcess("pextestprog mark ran.txt", "C:\\", true, 60000, false));
-    EXPECT_TRUE(plat::files::Exists("C:\\ran.txt"));
-    EXPECT_FALSE(RunProcess("nosuchprogram", "C:\\", true, kInfinite, true));
-    // Past its time-out the program is left running and the call fails.
-    EXPECT_FALSE(RunProcess("pextestprog sleep 2000", "C:\\", true, 20, true));
-    EXPECT_TRUE(RunProcess("pextestprog sleep 2000", "C:\\", false, 0, false));
-}
-
-TEST_F(UtilitiesTest, FileVersionOfAWindowsBinary) {
+// The text shows each part as a signed 16-bit number, as the snapshot always has.
+TEST_F(UtilitiesTest, FileVersionTextOfAWindowsBinary) {
     machine.WriteFile("C:\\App\\versioned.dll", pextest::ReadHostFile(PEX_FIXTURE_DIR "/versioned.dll"));
-    std::uint32_t ms = 0, ls = 0;
-    ASSERT_TRUE(GetFileVersion("C:\\App\\versioned.dll", &ms, &ls));
-    EXPECT_EQ(ms, (3u << 16) | 10u);
-    EXPECT_EQ(ls, (40000u << 16) | 5u);
     std::string text;
     EXPECT_TRUE(GetFileVersionText("C:\\App\\versioned.dll", &text));
-    EXPECT_EQ(text, "3.10.-25536.5");
+    EXPECT_EQ(text, "3.10.-25536.5");  // 3.10.40000.5
     machine.WriteFile("C:\\App\\plain.txt", "no version here");
     EXPECT_FALSE(GetFileVersionText("C:\\App\\plain.txt", &text));
     EXPECT_EQ(text, "");
 }
 
-TEST_F(UtilitiesTest, RegistryValueLines) {
-    const std::string sz("C:\\x", 5);
-    EXPECT_EQ(RegistryValueText("Path", reg::kRegSz, reinterpret_cast<const std::uint8_t*>(sz.data()), 5),
-              "\"Path\"=\"C:\\x\"");
-    const std::uint8_t dword[4] = {0xFF, 0xFF, 0xFF, 0xFF};
-    EXPECT_EQ(RegistryValueText("Flags", reg::kRegDword, dword, 4), "\"Flags\"=dword:ffffffff (-1)");
-    EXPECT_EQ(RegistryValueText("Blob", reg::kRegBinary, dword, 4), "\"Blob\" = Unsupported Type (3)");
-}
-
+// Keys that are not there are the snapshot's test (startup_snapshot_test.cpp).
 TEST_F(UtilitiesTest, RegistryKeyDumpIsRecursive) {
     long status = -1;
-    EXPECT_EQ(RegistryKeyDump("HKLM", reg::kLocalMachine, "Software\\Missing", &status),
-              "[HKLM\\Software\\Missing] -- not found\n");
-    EXPECT_EQ(status, 0);
     pextest::SetRegText(reg::kLocalMachine, "Software\\Suite", "Name", "Suite");
     pextest::SetRegValue(reg::kLocalMachine, "Software\\Suite\\Sub", "Blob", reg::kRegBinary, "\x01\x02");
-    pextest::SetRegValue(reg::kLocalMachine, "Software\\Suite\\Sub", "Count", reg::kRegDword,
-                         std::string("\x0A\0\0\0", 4));
+    pextest::SetRegValue(reg::kLocalMachine, "Software\\Suite\\Sub", "Count", reg::kRegDword, "\xFF\xFF\xFF\xFF");
     EXPECT_EQ(RegistryKeyDump("HKLM", reg::kLocalMachine, "Software\\Suite", &status),
               "[HKLM\\Software\\Suite]\n"
               "\"Name\"=\"Suite\"\n"
               "\n[HKLM\\Software\\Suite\\Sub]\n"
               "\"Blob\" = Unsupported Type (3)\n"
-              "\"Count\"=dword:a (10)\n");
+              "\"Count\"=dword:ffffffff (-1)\n");
     EXPECT_EQ(status, 0);
     // A value whose data does not fit fails the whole dump.
     pextest::SetRegValue(reg::kLocalMachine, "Software\\Suite\\Sub", "Big", reg::kRegBinary, std::string(4000, 'x'));
@@ -102,10 +75,7 @@ TEST_F(UtilitiesTest, InprocServerPathFollowsTheClassIdentifier) {
     EXPECT_EQ(InprocServerPath("Vantric.Test"), "C:\\b.dll");
 }
 
-TEST_F(UtilitiesTest, PathsTemporaryNamesAndDirectoryTrees) {
-    std::string path = "C:\\x\\y.txt";
-    ComposePath(path, "D:\\other\\z.dat", 8 + 4);
-    EXPECT_EQ(path, "C:\\x\\");
+TEST_F(UtilitiesTest, TrailingBackslashesTemporaryNamesAndDirectoryTrees) {
     EXPECT_EQ(AddTrailingBackslash(""), "\\");
     EXPECT_EQ(AddTrailingBackslash("C:\\a\\"), "C:\\a\\");
 

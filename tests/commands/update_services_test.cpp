@@ -3,16 +3,22 @@
 #include <gtest/gtest.h>
 
 #include "tests/expr/expr_test_support.h"
+#include "tests/support/test_machine.h"
+#include "tests/support/trace_capture.h"
 
 namespace {
 
 using exprtest::TestRow;
-using exprtest::TraceRecorder;
 using Node = COverrideExpression;
 using Lines = std::vector<std::string>;
 
-TEST(UpdateServices, SymbolsNameColumnsAndForcedNamesForceDownload) {
-    TraceRecorder trace;
+class UpdateServicesTest : public ::testing::Test {
+protected:
+    pextest::TestMachine machine;
+    pextest::TraceCapture trace;
+};
+
+TEST_F(UpdateServicesTest, SymbolsNameColumnsAndForcedNamesForceDownload) {
     TestRow row("Name,FORCE DOWNLOAD,homedir", "a.dll,1,C:\\App");
     for (const char* symbol : {"FORCED", "forced", "Forced"}) {
         EXPECT_TRUE(row.services.GetSymbol(symbol).boolValue) << symbol;
@@ -30,8 +36,7 @@ TEST(UpdateServices, SymbolsNameColumnsAndForcedNamesForceDownload) {
                      "Getting Symbol: homedir --> FieldName:[homedir]=[D:\\New]"}));
 }
 
-TEST(UpdateServices, ASymbolWithoutAColumnChangesNothing) {
-    TraceRecorder trace;
+TEST_F(UpdateServicesTest, ASymbolWithoutAColumnChangesNothing) {
     TestRow row("Name,HomeDir", "a.dll,C:\\App");
     Node value = row.services.GetSymbol("FORCED");
     EXPECT_EQ(value.type, Node::kError);

@@ -9,7 +9,6 @@
 #include "diag/trace_startup.h"
 #include "platform/errors.h"
 #include "platform/fault.h"
-#include "platform/files.h"
 #include "tests/support/test_machine.h"
 #include "tests/support/trace_capture.h"
 
@@ -25,11 +24,13 @@ protected:
     pextest::TraceCapture trace;
 };
 
-TEST_F(TraceLogTest, LineStartsWithTheLocalTimeStamp) {
-    TRACE(g_TraceLog, "CFile_: Apply %d", 7);
-    std::regex line(R"(\d{4}/\d{2}/\d{2} - \d{2}:\d{2}:\d{2}\.\d{3} - CFile_: Apply 7\r\n)");
-    EXPECT_TRUE(std::regex_match(trace.Bytes(), line)) << trace.Bytes();
-    EXPECT_EQ(trace.Lines(), Lines{"CFile_: Apply 7"});
+TEST_F(TraceLogTest, ALineStartsWithTheLocalTimeStampAndIsWrittenWholeHoweverLong) {
+    const std::string text = std::string(20000, 'x') + "end";
+    TRACE(g_TraceLog, "CFile_: Apply %d [%s] %d%% %5.1f", 7, text.c_str(), 42, 2.25);
+    const std::string bytes = trace.Bytes();
+    EXPECT_TRUE(std::regex_match(bytes.substr(0, 28), std::regex(R"(\d{4}/\d{2}/\d{2} - \d{2}:\d{2}:\d{2}\.\d{3} - )")))
+        << bytes.substr(0, 28);
+    EXPECT_EQ(bytes.substr(28), "CFile_: Apply 7 [" + text + "] 42%   2.2\r\n");
 }
 
 TEST_F(TraceLogTest, EveryLineEndsInExactlyOneCarriageReturnLineFeed) {
@@ -105,27 +106,13 @@ TEST_F(TraceLogTest, KeepOpenHoldsTheFileBetweenLines) {
     EXPECT_EQ(trace.Lines(), (Lines{"burst 1", "burst 2", "after"}));
 }
 
-// Start-up configuration, on a log of its own as the library's start-up uses it.
+// Start-up configuration, on a log of its own as the library's start-up uses it. The rotation
+// of the previous log is startup_snapshot_test's.
 class TraceStartupTest : public ::testing::Test {
 protected:
-    static constexpr const char* kLogPath = "C:\\Program Files\\Vantric\\log\\pex_support_mendler.log";
-    static constexpr const char* kBakPath = "C:\\Program Files\\Vantric\\log\\pex_support_mendler.bak";
-
     pextest::TestMachine m;
     TraceLog log;
 };
-
-TEST_F(TraceStartupTest, PreviousLogBecomesTheBackupAndTheNewLogStartsEmpty) {
-    m.WriteFile(kLogPath, "previous run\r\n");
-    m.WriteFile(kBakPath, "the run before\r\n");
-    ConfigureTraceLog(log, "C:\\Program Files\\Vantric\\Mendler.dll");
-
-    EXPECT_EQ(log.FileName(), kLogPath);
-    EXPECT_EQ(m.ReadFile(kBakPath), "previous run\r\n");
-    EXPECT_FALSE(plat::files::Exists(kLogPath));
-    TRACE(log, "Vantric Software Update - Mendler (%s)", "Version 02.01.00.17");
-    EXPECT_EQ(pextest::TraceLines(m.ReadFile(kLogPath)), Lines{"Vantric Software Update - Mendler (Version 02.01.00.17)"});
-}
 
 TEST_F(TraceStartupTest, CreatesTheLogFolderWithItsParentsAndInstallsTheSubstitution) {
     ConfigureTraceLog(log, "C:\\Deep\\Er\\Mendler.dll");
@@ -135,13 +122,12 @@ TEST_F(TraceStartupTest, CreatesTheLogFolderWithItsParentsAndInstallsTheSubstitu
     TRACE(log, "ProgID: [%s.Agent]", kTraceHiddenWord);
     EXPECT_EQ(pextest::TraceLines(m.ReadFile(log.FileName())),
               Lines{"ProgID: [" + std::string(kTraceHiddenWordToken) + ".Agent]"});
-}
 
-TEST_F(TraceStartupTest, WithoutAModulePathTheLogIsAtTheDriveRoot) {
-    ConfigureTraceLog(log, "");
-    EXPECT_EQ(log.FileName(), "c:\\log.log");
-    ConfigureTraceLog(log, "C:\\" + std::string(1100, 'a') + "\\Mendler.dll");
-    EXPECT_EQ(log.FileName(), "c:\\log.log");
+    // Without a usable module path the log is at the drive's root.
+    for (const std::string& module : {std::string(), "C:\\" + std::string(1100, 'a') + "\\Mendler.dll"}) {
+        ConfigureTraceLog(log, module);
+        EXPECT_EQ(log.FileName(), "c:\\log.log");
+    }
 }
 
 }  // namespace

@@ -6,13 +6,14 @@
 #include "expr/evaluation.h"
 #include "platform/paths.h"
 #include "tests/expr/expr_test_support.h"
+#include "tests/support/test_machine.h"
+#include "tests/support/trace_capture.h"
 
 namespace {
 
 using exprtest::FailureOf;
 using exprtest::ParseExpression;
 using exprtest::TestRow;
-using exprtest::TraceRecorder;
 using Node = COverrideExpression;
 using Lines = std::vector<std::string>;
 
@@ -26,7 +27,7 @@ std::string Literal(const std::string& text) {
     return literal + "\"";
 }
 
-Lines Matching(const TraceRecorder& trace, const std::string& part) {
+Lines Matching(const pextest::TraceCapture& trace, const std::string& part) {
     Lines lines;
     for (const std::string& line : trace.Lines()) {
         if (line.find(part) != std::string::npos) lines.push_back(line);
@@ -34,21 +35,17 @@ Lines Matching(const TraceRecorder& trace, const std::string& part) {
     return lines;
 }
 
-TEST(Builtins, AndOrSkipTheSecondOperandOnceTheFirstDecides) {
+// AND and OR skip the second operand once the first decides; selectors evaluate one branch.
+TEST(Builtins, OnlyTheDecidingOperandsAreEvaluated) {
     TestRow row;  // AVAR reads as true
     EXPECT_FALSE(Value("FALSE AND AVAR", row).boolValue);
     EXPECT_TRUE(Value("TRUE OR AVAR", row).boolValue);
     EXPECT_FALSE(Value("AND(FALSE, \"not even checked\")", row).boolValue);
+    EXPECT_EQ(Value("IIFS(TRUE, \"a\", 5)", row).stringValue, "a");
     EXPECT_TRUE(row.services.reads.empty());
     EXPECT_TRUE(Value("FALSE OR AVAR", row).boolValue);
-    EXPECT_EQ(row.services.reads, Lines{"AVAR"});
-}
-
-TEST(Builtins, SelectorsEvaluateOneBranch) {
-    TestRow row;
-    EXPECT_EQ(Value("IIFS(TRUE, \"a\", 5)", row).stringValue, "a");
     EXPECT_EQ(Value("IIFS(AVAR, HomeDir, FileName)", row).stringValue, "C:\\App");
-    EXPECT_EQ(row.services.reads, (Lines{"AVAR", "HomeDir"}));
+    EXPECT_EQ(row.services.reads, (Lines{"AVAR", "AVAR", "HomeDir"}));
     EXPECT_EQ(Value("IIFN(FALSE, \"x\", 2.5)", row).number, 2.5);
 }
 
@@ -104,8 +101,9 @@ TEST(Builtins, FailureMessages) {
 }
 
 TEST(Builtins, FileTests) {
-    TraceRecorder trace;
-    trace.Machine().WriteFile("C:\\App\\a.dll", "no version information");
+    pextest::TestMachine machine;
+    pextest::TraceCapture trace;
+    machine.WriteFile("C:\\App\\a.dll", "no version information");
     TestRow row;
     EXPECT_TRUE(Value("FileExists(AddPathSep(HomeDir) & FileName)", row).boolValue);
     EXPECT_TRUE(Value("FileExists(\"c:\\\\app\\\\*.DLL\")", row).boolValue);
@@ -131,7 +129,8 @@ TEST(Builtins, FileTests) {
 }
 
 TEST(Builtins, LookupsAreIndentedByTheNestingDepth) {
-    TraceRecorder trace;
+    pextest::TestMachine machine;
+    pextest::TraceCapture trace;
     TestRow row;
     Value("NOT (AVAR AND IIFB(TRUE, AVAR, FALSE))", row);
     EXPECT_EQ(Matching(trace, "Looking up"), (Lines{"         Looking up Variable [AVAR] of type Bool",

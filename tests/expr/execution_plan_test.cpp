@@ -4,22 +4,22 @@
 
 #include "expr/expression_tree.h"
 #include "tests/expr/expr_test_support.h"
+#include "tests/support/test_machine.h"
+#include "tests/support/trace_capture.h"
 
 namespace {
 
+using exprtest::QuietParse;
 using exprtest::TestRow;
-using exprtest::TraceRecorder;
 using Lines = std::vector<std::string>;
 
-bool QuietParse(ExecutionPlan& plan, const std::string& text) {
-    testing::internal::CaptureStdout();
-    bool ok = plan.Parse(text);
-    testing::internal::GetCapturedStdout();
-    return ok;
-}
+class ExecutionPlanTest : public ::testing::Test {
+protected:
+    pextest::TestMachine machine;
+    pextest::TraceCapture trace;
+};
 
-TEST(ExecutionPlan, OneAssignmentFromParseToRow) {
-    TraceRecorder trace;
+TEST_F(ExecutionPlanTest, OneAssignmentFromParseToRow) {
     TestRow row;
     ExecutionPlan plan;
     ASSERT_TRUE(QuietParse(plan, "FORCED = TRUE"));
@@ -37,8 +37,7 @@ TEST(ExecutionPlan, OneAssignmentFromParseToRow) {
                      "That's all folks!"}));
 }
 
-TEST(ExecutionPlan, TreeBuildingTraces) {
-    TraceRecorder trace;
+TEST_F(ExecutionPlanTest, TreeBuildingTraces) {
     ExecutionPlan plan;
     ASSERT_TRUE(QuietParse(plan, "SNOOZEABLE = AND(TRUE, \"x\"); FORCED = FileName"));
     EXPECT_EQ(trace.Lines(),
@@ -52,14 +51,7 @@ TEST(ExecutionPlan, TreeBuildingTraces) {
                      "Assigning Setting:FORCED()=FileName()", "pushing # 2, SET()"}));
 }
 
-TEST(ExecutionPlan, EveryItemRunsAndFailuresAreRecorded) {
-    TestRow row;
-    ExecutionPlan twice;
-    ASSERT_TRUE(QuietParse(twice, "FORCED = TRUE; FORCED = FALSE"));
-    EXPECT_EQ(twice.Execute(row.services), 0);
-    EXPECT_EQ(row.services.writes, (Lines{"FORCED=1", "FORCED=0"}));
-
-    TraceRecorder trace;
+TEST_F(ExecutionPlanTest, EveryItemRunsAndFailuresAreRecorded) {
     TestRow noAvar("Force Download,HomeDir", "0,C:\\App");
     ExecutionPlan plan;
     ASSERT_TRUE(QuietParse(plan, "FORCED = AND(AVAR, TRUE); FORCED = NOT FORCED"));
@@ -77,8 +69,7 @@ TEST(ExecutionPlan, EveryItemRunsAndFailuresAreRecorded) {
                      "That's all folks!"}));
 }
 
-TEST(ExecutionPlan, ValidationStopsCheckingAfterTheFirstInvalidItem) {
-    TraceRecorder trace;
+TEST_F(ExecutionPlanTest, ValidationStopsCheckingAfterTheFirstInvalidItem) {
     ExecutionPlan plan;
     ASSERT_TRUE(QuietParse(plan, "FORCED = \"x\"; FORCED = 1"));
     trace.Clear();
@@ -92,7 +83,7 @@ TEST(ExecutionPlan, ValidationStopsCheckingAfterTheFirstInvalidItem) {
     EXPECT_EQ(plan.Comments().size(), 1u);  // comments start afresh
 }
 
-TEST(ExecutionPlan, TheCurrentPlanReceivesThePushes) {
+TEST_F(ExecutionPlanTest, TheCurrentPlanReceivesThePushes) {
     {
         ExecutionPlan plan;
         EXPECT_FALSE(QuietParse(plan, ""));

@@ -1,7 +1,6 @@
-// Helpers of the expression-language tests: a row with recording services, parsing of one
-// text into a fresh plan, and the trace lines a test produced (without time stamps).
+// Helpers of the expression-language tests: a row with recording services and parsing of one
+// text into a fresh plan. Their traces are read with pextest::TraceCapture.
 #pragma once
-#include <memory>
 #include <string>
 #include <vector>
 
@@ -9,12 +8,10 @@
 #include "expr/execution_plan.h"
 #include "expr/override_expression.h"
 #include "manifest/content_table.h"
-#include "tests/support/test_machine.h"
 
 namespace exprtest {
 
-// A content table of one row built from a header and a data line, and services over that row
-// that record every GetSymbol and SetSymbol before doing the real work.
+// Services over one row that record the name of every GetSymbol before doing the real work.
 class RecordingServices : public UpdateServices {
 public:
     explicit RecordingServices(RowReference& row) : UpdateServices(row) {}
@@ -22,13 +19,10 @@ public:
         reads.push_back(name);
         return UpdateServices::GetSymbol(name);
     }
-    std::int32_t SetSymbol(std::string name, COverrideExpression& value) override {
-        writes.push_back(name + "=" + value.ValueText());
-        return UpdateServices::SetSymbol(name, value);
-    }
-    std::vector<std::string> reads, writes;
+    std::vector<std::string> reads;
 };
 
+// A content table of one row built from a header and a data line, with recording services.
 class TestRow {
 public:
     explicit TestRow(const std::string& header = "Force Download,HomeDir,FileName,AVAR",
@@ -39,7 +33,10 @@ public:
     RecordingServices services{ref};
 };
 
-// Parses text into a fresh plan; stdout (where the parser reports) is captured into output.
+// plan.Parse(text) with stdout (where the parser reports) captured into *output when given.
+bool QuietParse(ExecutionPlan& plan, const std::string& text, std::string* output = nullptr);
+
+// Parses text into a fresh plan.
 struct Parsed {
     bool ok = false;
     std::vector<std::string> items;  // ExpressionText of each item
@@ -52,22 +49,6 @@ COverrideExpression ParseExpression(const std::string& text);
 
 // Runs the plan's validation and returns its comments, or {"valid"} when it passed.
 std::vector<std::string> ValidationOf(const std::string& text);
-
-// Routes the trace log into a file of a fresh machine, without time stamps, while it lives.
-class TraceRecorder {
-public:
-    TraceRecorder();
-    ~TraceRecorder();
-    TraceRecorder(const TraceRecorder&) = delete;
-    TraceRecorder& operator=(const TraceRecorder&) = delete;
-    // The lines written since construction (or the last Clear), without line ends.
-    std::vector<std::string> Lines() const;
-    void Clear();
-    const pextest::TestMachine& Machine() const { return machine_; }
-
-private:
-    pextest::TestMachine machine_;
-};
 
 // The message of the failure object that evaluating node throws; "no failure" otherwise.
 std::string FailureOf(const COverrideExpression& node, UpdateServices& services);

@@ -45,12 +45,6 @@ TEST(OverrideGrammar, TextShapes) {
         {"FORCED = FORCED OR FileVersionAtLeast(HomeDir & FileName, \"4.1.0.0\")",
          "SET(FORCED, OR(FORCED, FileVersionAtLeast(CONCAT(HomeDir, FileName), \"4.1.0.0\")))"},
     });
-    exprtest::Parsed two = ParseText(
-        "FORCED = IIFB(IsUnderstood(\"FileExists\"), FileExists(AddPathSep(HomeDir) & \"x.exe\"), "
-        "FALSE); FORCED = FORCED XOR TRUE");
-    EXPECT_EQ(two.items, (Items{"SET(FORCED, IIFB(IsUnderstood(\"FileExists\"), "
-                                "FileExists(CONCAT(AddPathSep(HomeDir), \"x.exe\")), FALSE))",
-                                "SET(FORCED, XOR(FORCED, TRUE))"}));
     ExpectSyntaxErrors({"", "FORCED = TRUE;", "TRUE", "FORCED = FileExists()", "HomeDir = \"x\"",
                         "FORCED = TRUE FALSE"});
     // Assignments reduced before the error stay in the plan.

@@ -20,6 +20,7 @@ TEST(Validation, CommentsOfParsedTexts) {
          {"Type mismatch between  and ", "Attempting to set unsettable object:"}},
         {"FORCED = SET(HomeDir, \"x\")", {"Type mismatch between FORCED and SET"}},
         {"FORCED = Foo(TRUE)", {"Type mismatch between FORCED and Foo"}},
+        {"FORCED = FileExists(concat(\"a\", \"b\"))", {"valid"}},  // result types by any case
         {"FORCED = AND(TRUE)", {"Wrong # of parameters for AND - expects 2"}},
         {"FORCED = AND(TRUE, \"x\")", {"AND: Type mismatch for Parameter # 2  - expected Bool"}},
         {"FORCED = AND(TRUE, Nope)", {"AND: Type mismatch for Parameter # 2  - expected Bool"}},

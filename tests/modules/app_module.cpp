@@ -4,13 +4,8 @@
 #include <cstdint>
 
 #include "platform/app.h"
+#include "module_export.h"
 #include "platform/registry.h"
-
-#ifdef _WIN32
-#define PEX_EXPORT extern "C" __declspec(dllexport)
-#else
-#define PEX_EXPORT extern "C" __attribute__((visibility("default")))
-#endif
 
 namespace {
 

@@ -5,13 +5,8 @@
 #include <cstdint>
 #include <cstring>
 
+#include "module_export.h"
 #include "platform/registry.h"
-
-#ifdef _WIN32
-#define PEX_EXPORT extern "C" __declspec(dllexport)
-#else
-#define PEX_EXPORT extern "C" __attribute__((visibility("default")))
-#endif
 
 PEX_EXPORT const char* PexModuleName() { return PEX_MODULE_NAME; }
 
