@@ -6,10 +6,7 @@
 # it. Apart, the search finds only the copies (or stand-ins) that each test places on its machine.
 if(TARGET pex_decompress AND TARGET Rivzip)
   pex_add_test(decompress_test
-    SOURCES
-      ${CMAKE_CURRENT_SOURCE_DIR}/decompress/in_place_expansion_test.cpp
-      ${CMAKE_CURRENT_SOURCE_DIR}/decompress/library_location_test.cpp
-      ${CMAKE_CURRENT_SOURCE_DIR}/decompress/expand_progress_test.cpp
+    SOURCES ${CMAKE_CURRENT_SOURCE_DIR}/decompress/dispatcher_test.cpp
     LIBS pex_decompress rivzip_codec)
   set_target_properties(decompress_test PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${CMAKE_CURRENT_BINARY_DIR}/decompress)
   # PexNoVersion (tests/platform_system.cmake) stands for a library without the expand entry.

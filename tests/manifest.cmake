@@ -2,8 +2,6 @@
 pex_add_test(content_table_test
   SOURCES ${CMAKE_CURRENT_SOURCE_DIR}/manifest/content_table_test.cpp
   LIBS pex_manifest)
-foreach(unit product_settings content_file download_type)
-  pex_add_test(manifest_${unit}_test
-    SOURCES ${CMAKE_CURRENT_SOURCE_DIR}/manifest/${unit}_test.cpp
-    LIBS mendler_core)
-endforeach()
+pex_add_test(manifest_parser_test
+  SOURCES ${CMAKE_CURRENT_SOURCE_DIR}/manifest/manifest_parser_test.cpp
+  LIBS mendler_core)

@@ -1,9 +1,9 @@
-# Rivzip.dll: the SZDD codec through its byte interfaces, against independent tools (mscompress,
-# msexpand, libmspack; each test skips when its tool is missing), and the module's entries on
+# Rivzip.dll: the SZDD codec through its byte interfaces, against independent tools (samples made
+# by mscompress, and libmspack when it is installed), and the module's entries on
 # CFile objects.
 if(TARGET rivzip_codec)
   pex_add_test(rivzip_codec_test
-    SOURCES rivzip/memory_streams.cpp rivzip/szdd_roundtrip_test.cpp rivzip/szdd_expander_test.cpp
+    SOURCES rivzip/memory_streams.cpp rivzip/szdd_codec_test.cpp
     LIBS rivzip_codec)
 
   pex_add_test(rivzip_interop_test

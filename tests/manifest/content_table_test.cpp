@@ -1,9 +1,12 @@
+// The content table: loading CSV text, access by column name, rendering, saving, and the
+// upgrade statuses recorded in it.
 #include "manifest/content_table.h"
 
 #include <gtest/gtest.h>
 
 #include <string>
 
+#include "model/upgrade_status.h"
 #include "platform/cfile.h"
 #include "platform/errors.h"
 #include "platform/fault.h"
@@ -30,25 +33,20 @@ std::string Load(const std::string& bytes, bool header = true) {
 
 const std::string kFailed = "failed " + std::to_string(CContentTable::kFail);
 
-TEST(ContentTableLoad, LineEnds) {
+// Any line end; the table ends at the first empty line, and nothing after it is read, not even
+// a row that would fail the load.
+TEST(ContentTableLoad, LineEndsAndTheFirstEmptyLine) {
     for (const char* text : {"A,B\r\n1,2\r\n3,4\r\n", "A,B\n1,2\n3,4\n", "A,B\r1,2\r3,4\r",
                              "A,B\r\n1,2\n3,4", "A,B\r1,2\r\n3,4\n"}) {
         EXPECT_EQ("A|B;1|2;3|4", Load(text)) << text;
     }
-}
-
-// The table ends at the first empty line, whatever its line end; nothing after it is read,
-// not even a row that would fail the load.
-TEST(ContentTableLoad, FirstEmptyLineEndsTheTable) {
     for (const char* text : {"A,B\r\n1,2\r\n\r\n3,4\r\n", "A,B\n1,2\n\n3,4\n", "A,B\r1,2\r\r3,4\r",
                              "A,B\r\n1,2\r\n\n3,4\r\n", "A,B\r\n1,2\r\n\r3,4\r\n"}) {
         EXPECT_EQ("A|B;1|2", Load(text)) << text;
     }
     EXPECT_EQ("A|B|C", Load("A,B,C\r\n\r\nx,y,z,too,many\r\n"));
     EXPECT_EQ("A|B", Load("A,B"));
-    EXPECT_EQ(kFailed, Load(""));
-    EXPECT_EQ(kFailed, Load("\r\nA,B\r\n"));
-    EXPECT_EQ(kFailed, Load("\nA,B\n"));
+    for (const char* text : {"", "\r\nA,B\r\n", "\nA,B\n"}) EXPECT_EQ(kFailed, Load(text)) << text;
 }
 
 TEST(ContentTableLoad, CommasAndQuotes) {
@@ -89,12 +87,29 @@ TEST(ContentTableText, RenderingPadsEachColumnToItsWidestEntry) {
               table.ToText());
 }
 
-TEST(ContentTableText, WritingEndsEveryLineInCrLfWithoutQuotes) {
-    CContentTable table;
-    table.LoadFromText("A,B\n\"q\", x\n\"x,y\"\n");
-    EXPECT_EQ("A,B\r\nq, x\r\n\"x,y\"\r\n", table.ToFileText());
-    table.SetCell(0, 1, "two\nlines\r\n");
-    EXPECT_EQ("A,B\r\nq,two\r\nlines\r\n\r\n\"x,y\"\r\n", table.ToFileText());
+TEST(UpgradeStatusCodes, TextsAndCodesConvertExactly) {
+    for (int code = 0; code < kUpgradeStatusCount; ++code) {
+        EXPECT_EQ(code, UpgradeStatusCodeOf(UpgradeStatusText(code)));
+    }
+    EXPECT_EQ(nullptr, UpgradeStatusText(9));
+    for (const char* text : {"downloaded", "Downloaded ", "Skipped", "MissingDependancySkipped"}) {
+        EXPECT_EQ(-1, UpgradeStatusCodeOf(text)) << text;
+    }
+}
+
+// Only the two transient texts, written exactly, change; the column is found without regard to
+// case, and a table without it is left alone.
+TEST(UpgradeStatusCodes, NormalizingReplacesTheTransientTextsOnly) {
+    CContentTable table, other;
+    table.LoadFromText("FileName,upgradestatus\r\na,Skipped\r\nb,MissingDependancySkipped\r\n"
+                       "c,skipped\r\nd,Skipped \r\ne,Downloaded\r\nf\r\n");
+    NormalizeUpgradeStatus(table);
+    EXPECT_EQ("FileName,upgradestatus\r\na,AppliedSuccessfully\r\nb,ApplicationFailed\r\n"
+              "c,skipped\r\nd,Skipped \r\ne,Downloaded\r\nf,\r\n",
+              table.ToFileText());
+    other.LoadFromText("FileName,Status\r\nSkipped,Skipped\r\n");
+    NormalizeUpgradeStatus(other);
+    EXPECT_EQ("FileName,Status\r\nSkipped,Skipped\r\n", other.ToFileText());
 }
 
 class ContentTableFile : public ::testing::Test {
@@ -103,12 +118,16 @@ protected:
     pextest::TestMachine machine_;
 };
 
+// Read by any case of its name; written back with CR LF line ends and without quotes, a cell's
+// own line ends as they are.
 TEST_F(ContentTableFile, LoadsAndWritesBack) {
-    machine_.WriteFile("C:\\Pex\\content.csv", "FileName,Command\n\"a.dll\", run\nb.dll\n");
+    machine_.WriteFile("C:\\Pex\\content.csv", "FileName,Command\n\"a.dll\", run\n\"x,y\"\nb.dll\n");
     CContentTable table;
     ASSERT_EQ(CContentTable::kOk, table.LoadFromFile("c:\\pex\\CONTENT.csv"));
+    table.SetCell(2, 1, "two\nlines\r\n");
     EXPECT_EQ(CContentTable::kOk, table.SaveToFile("C:\\Pex\\content.csv"));
-    EXPECT_EQ("FileName,Command\r\na.dll, run\r\nb.dll,\r\n", machine_.ReadFile("C:\\Pex\\content.csv"));
+    EXPECT_EQ("FileName,Command\r\na.dll, run\r\n\"x,y\"\r\nb.dll,two\r\nlines\r\n\r\n",
+              machine_.ReadFile("C:\\Pex\\content.csv"));
 
     EXPECT_EQ(CContentTable::kFalse, CContentTable().SaveToFile("C:\\empty.csv"));
     EXPECT_EQ("\r\n", machine_.ReadFile("C:\\empty.csv"));

@@ -1,9 +1,11 @@
-// CMasterList: where files go, the order of a walk over the groups, the files-added count and
-// the dependency check that holds a group back.
+// CFileGroup and CMasterList: dependency lists, the group's decompressed and applied states,
+// where files go, the order of a walk over the groups, the files-added count and the dependency
+// check that holds a group back.
 #include "model/master_list.h"
 
 #include <gtest/gtest.h>
 
+#include <set>
 #include <string>
 #include <vector>
 
@@ -14,14 +16,59 @@ namespace {
 
 using Lines = std::vector<std::string>;
 
-CFile_ Row(std::uint32_t row) {
-    return CFile_(row, true, false, "C:\\App", "f" + std::to_string(row) + ".dll",
-                  "C:\\Cache\\f" + std::to_string(row) + ".dll", "", "", false, 0);
+CFile_ Row(std::uint32_t row, bool applied = false, bool needsDecompression = false) {
+    const std::string name = "f" + std::to_string(row) + ".dll";
+    return CFile_(row, true, applied, "C:\\App", name, "C:\\Cache\\" + name, "", "", needsDecompression,
+                  needsDecompression ? 1 : 0);
+}
+
+TEST(FileGroup, DependancyListsSplitAtSemicolonsIntoTrimmedNamesKeptAsWritten) {
+    const struct {
+        const char* text;
+        bool result;
+        std::set<std::string> names;
+    } cases[] = {
+        {"A; B", true, {"A", "B"}},
+        {"A;  \t", true, {"A"}},
+        {" \n ", true, {}},
+        {"A;;B", true, {"", "A", "B"}},
+        {";A", true, {"", "A"}},
+        {"A;a; A", false, {"A", "a"}},  // the repeat is reported and kept once
+        {"b\r;A", true, {"A", "b\r"}},  // carriage returns are kept
+    };
+    for (const auto& c : cases) {
+        CFileGroup group("G");
+        EXPECT_EQ(c.result, group.AddDependancies(c.text)) << c.text;
+        EXPECT_EQ(c.names, group.GetDependancies()) << c.text;
+    }
+}
+
+TEST(FileGroup, MembersKeepTheirOrderAndTheFirstUnappliedOneDecides) {
+    pextest::TestMachine machine;
+    CFileGroup group("G");
+    EXPECT_TRUE(group.IsGroupApplied());
+    EXPECT_TRUE(group.IsGroupDecompressed());
+    group.AddFileToGroup(Row(3, true));
+    group.AddFileToGroup(Row(1, false, true));
+    EXPECT_TRUE(group.AddFileAndDependancies(Row(2), ""));
+    std::vector<std::uint32_t> rows;
+    for (const CFile_& file : group.GetFiles()) rows.push_back(file.GetRow());
+    EXPECT_EQ(rows, (std::vector<std::uint32_t>{3, 1, 2}));
+
+    pextest::TraceCapture trace;
+    EXPECT_FALSE(group.IsGroupApplied());
+    EXPECT_FALSE(group.IsGroupDecompressed());
+    EXPECT_EQ(trace.Lines(), (Lines{
+        "File 'f3.dll' is applied",
+        "File 'f1.dll' is not applied",
+        "CFileGroup: IsGroupApplied complete 0",
+        "CFileGroup: IsGroupDecompressed complete 0",
+    }));
 }
 
 // "key:name:rows" for every group, in walk order.
-std::vector<std::string> Walk(const CMasterList& list) {
-    std::vector<std::string> out;
+Lines Walk(const CMasterList& list) {
+    Lines out;
     for (const auto& [key, group] : list) {
         std::string entry = key + ":" + group.GetName() + ":";
         for (const CFile_& file : group.GetFiles()) entry += std::to_string(file.GetRow());
@@ -68,15 +115,19 @@ protected:
     pextest::TraceCapture trace;
 };
 
+// A missing group and an empty one count as applied.
 TEST_F(Dependancies, AGroupWaitsUntilEveryMemberOfItsDependancyIsApplied) {
     CMasterList list;
     list.AddFile("App", Row(3), "base;Missing");
     list.AddFile("BASE", Row(1), "");
     list.AddFile("Base", Row(2), "");
+    list.AddNewFileGroup("Empty");
+    list.AddFile("Waits", Row(4), "EMPTY;gone");
+    EXPECT_TRUE(list.DependedOnItemsApplied(Group(list, "Waits")));
     const auto app = Group(list, "App");
     trace.Clear();
     EXPECT_FALSE(list.DependedOnItemsApplied(app));
-    // Names are taken in byte order: the missing one first, which counts as met.
+    // Names are taken in byte order: the missing one first.
     EXPECT_EQ(trace.Lines(), (Lines{
         "CMasterList DependedOnItemsApplied",
         "CMasterList checking dependancies, 2 to check",
@@ -93,17 +144,6 @@ TEST_F(Dependancies, AGroupWaitsUntilEveryMemberOfItsDependancyIsApplied) {
 
     ApplyAll(Group(list, "BASE")->second);
     EXPECT_TRUE(list.DependedOnItemsApplied(app));
-}
-
-TEST_F(Dependancies, EmptyMissingAndOwnGroups) {
-    CMasterList list;
-    list.AddNewFileGroup("Empty");
-    list.AddFile("Waits", Row(1), "EMPTY;gone");
-    list.AddFile("Self", Row(2), "self");
-    EXPECT_TRUE(list.DependedOnItemsApplied(Group(list, "Waits")));
-    EXPECT_FALSE(list.DependedOnItemsApplied(Group(list, "Self")));
-    ApplyAll(Group(list, "Self")->second);
-    EXPECT_TRUE(list.DependedOnItemsApplied(Group(list, "Self")));
 }
 
 TEST_F(Dependancies, UnnamedGroupsAreNeverCheckedButTheEmptyNameFindsThem) {

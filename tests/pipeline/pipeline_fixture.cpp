@@ -2,7 +2,6 @@
 
 #include <algorithm>
 
-#include "platform/files.h"
 #include "tests/support/test_registry.h"
 
 namespace reg = plat::reg;
@@ -41,19 +40,15 @@ void PipelineTest::Publish(const std::vector<ContentRow>& rows, const std::strin
     machine.WriteFile(kContent, text);
 }
 
-std::string PipelineTest::Download(const std::string& name, const std::string& bytes) {
-    const std::string path = "C:\\Pex\\cache\\" + name;
-    machine.WriteFile(path, bytes);
-    return path;
-}
-
 ContentRow PipelineTest::Row(const std::string& fileName, const std::string& bytes, const std::string& group,
                              const std::string& dependancies) {
+    const std::string download = "C:\\Pex\\cache\\" + fileName + ".new";
+    machine.WriteFile(download, bytes);
     return {{"FileName", fileName},
             {"UpgradeStatus", "Downloaded"},
             {"HomeDir", kHome},
             {"InterestedParties", "Nobody"},  // no capabilities: LZW, harmless without decompression
-            {"DownLoadCacheFile", Download(fileName + ".new", bytes)},
+            {"DownLoadCacheFile", download},
             {"FileGroup", group},
             {"DependancyOrder", dependancies},
             {"NeedsDecompression", "0"}};
@@ -82,8 +77,6 @@ bool PipelineTest::ContentEntriesPresent() const {
 std::string PipelineTest::Installed(const std::string& fileName) const {
     return machine.ReadFile(std::string(kHome) + "\\" + fileName);
 }
-
-bool PipelineTest::ExistsOnMachine(const std::string& winPath) const { return plat::files::Exists(winPath); }
 
 int PipelineTest::Count(const std::string& line) const {
     const auto lines = trace.Lines();

@@ -24,9 +24,8 @@ protected:
 
     // Registers the product with its content file and mode; writes the content file.
     void Publish(const std::vector<ContentRow>& rows, const std::string& mode = "");
-    // A download in C:\Pex\cache with these bytes; returns its path.
-    std::string Download(const std::string& name, const std::string& bytes);
-    // A row installing fileName from a download of bytes, in status Downloaded.
+    // A row installing fileName from a download of bytes (C:\Pex\cache\<fileName>.new), in
+    // status Downloaded.
     ContentRow Row(const std::string& fileName, const std::string& bytes, const std::string& group = "",
                    const std::string& dependancies = "");
 
@@ -36,7 +35,6 @@ protected:
     bool ContentEntriesPresent() const;
 
     std::string Installed(const std::string& fileName) const;  // bytes at C:\App\fileName
-    bool ExistsOnMachine(const std::string& winPath) const;
     // How many lines equal the text.
     int Count(const std::string& line) const;
 

@@ -2,15 +2,12 @@
 // or host paths, exit codes, and no half-expanded output left behind.
 #include <gtest/gtest.h>
 
-#include <cstdlib>
 #include <string>
-#ifndef _WIN32
-#include <sys/wait.h>
-#endif
 
 #include "platform/files.h"
 #include "tests/rivzip/memory_streams.h"
 #include "tests/support/platform_guard.h"
+#include "tests/support/run_pexupdate.h"
 #include "tests/support/test_machine.h"
 
 namespace rivziptest {
@@ -20,19 +17,7 @@ namespace {
 class CompressCommand : public ::testing::Test {
 protected:
     void SetUp() override { PEX_LINUX_ONLY(); }
-
-#ifdef _WIN32
-    int Pexupdate(const std::string&) { return -1; }
-#else
-    // Runs pexupdate on this test's machine; args go to the shell as they stand.
-    int Pexupdate(const std::string& args) {
-        std::string command = "'" PEXUPDATE_PATH "' --machine '" + machine_.Root() + "' " + args +
-                              " >/dev/null 2>&1";
-        int status = std::system(command.c_str());
-        return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
-    }
-#endif
-
+    int Pexupdate(const std::string& args) { return pextest::RunPexupdate(PEXUPDATE_PATH, machine_, args).exit; }
     pextest::TestMachine machine_;
 };
 

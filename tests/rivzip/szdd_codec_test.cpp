@@ -1,18 +1,27 @@
-// The SZDD expander on hand-made and hostile data: the format's window rules, every kind of bad
-// input giving its negative result without writing past the declared length, progress reports,
-// and streaming in fixed blocks.
+// The SZDD compressor and expander over memory: whatever goes in comes back, whatever its size,
+// content or the way the source hands it over; the compressor compresses; the expander follows
+// the format's window rules on hand-made data and gives every kind of bad input its negative
+// result without writing past the declared length; failures, progress reports, and streaming in
+// fixed blocks.
 #include <gtest/gtest.h>
 
 #include <random>
 #include <string>
 
 #include "rivzip/rivzip_result.h"
+#include "rivzip/szdd_compressor.h"
 #include "rivzip/szdd_expander.h"
 #include "rivzip/szdd_format.h"
 #include "tests/rivzip/memory_streams.h"
 
 namespace rivziptest {
 namespace {
+
+void ExpectRoundTrip(const Bytes& original, std::uint32_t maxChunk = UINT32_MAX) {
+    Bytes back;
+    ASSERT_EQ(Expand(Compress(original, maxChunk), &back, maxChunk), static_cast<std::int32_t>(original.size()));
+    EXPECT_TRUE(back == original) << "size " << original.size();
+}
 
 // Expands and gives the text, or the result code in brackets.
 std::string ExpandText(const Bytes& szdd) {
@@ -30,6 +39,30 @@ Bytes Cat(std::initializer_list<Bytes> parts) {
 // A match item of the given ring position and length.
 Bytes M(std::uint32_t position, std::uint32_t length) {
     return {static_cast<std::uint8_t>(position), static_cast<std::uint8_t>(((position >> 4) & 0xF0) | (length - 3))};
+}
+
+TEST(SzddRoundTrip, SizesAroundEveryEdgeKindsOfContentAndShortReads) {
+    // Around the match lengths, the window, the 1 KiB report and the 64 KiB I/O blocks.
+    for (std::size_t size : {0, 1, 2, 3, 17, 18, 19, 1024, 4095, 4096, 4097, 65535, 65536, 65537, 69632, 131073}) {
+        ExpectRoundTrip(TextLike(size, 1));
+        ExpectRoundTrip(RandomBytes(size, 2));
+    }
+    Bytes allValues(70000), runs(200000), megabytes;
+    for (std::size_t i = 0; i < allValues.size(); ++i) allValues[i] = static_cast<std::uint8_t>(i);
+    for (std::size_t i = 0; i < runs.size(); ++i) runs[i] = static_cast<std::uint8_t>(i / 1000 % 3 ? i / 1000 : 0);
+    for (std::uint32_t part = 0; part < 8; ++part) {
+        Bytes piece = part % 2 ? TextLike(400000, part) : RandomBytes(100000, part);
+        megabytes.insert(megabytes.end(), piece.begin(), piece.end());
+    }
+    for (const Bytes& b : {allValues, runs, Bytes(100000, ' '), Bytes(100000, 0), megabytes}) ExpectRoundTrip(b);
+    for (std::uint32_t chunk : {1u, 7u, 17u, 4099u}) ExpectRoundTrip(TextLike(20000, chunk), chunk);
+}
+
+TEST(SzddCompressor, CompressesAndBoundsGrowth) {
+    EXPECT_LT(Compress(TextLike(100000, 4)).size(), 50000u);
+    EXPECT_LT(Compress(Bytes(100000, 0)).size(), 100000u / 8);
+    // Incompressible data costs the header and one flag byte per eight literals.
+    EXPECT_LE(Compress(RandomBytes(100000, 5)).size(), 14u + 100000 + 12500);
 }
 
 TEST(SzddExpander, FollowsTheWindowRules) {
@@ -82,34 +115,44 @@ TEST(SzddExpander, RandomDataNeverOverrunsTheDeclaredLength) {
     }
 }
 
-TEST(SzddExpander, ReadAndWriteFailuresGiveTheirCodes) {
-    Bytes good = Compress(RandomBytes(300000, 16));
-    for (std::uint64_t at : {0, 10, 70000, 200000}) {
-        MemorySource source(good);
-        source.failAfter = at;
+// A source that fails or holds another length than stated, or a sink that refuses, in either
+// direction.
+TEST(SzddCodec, FailuresGiveTheirCodes) {
+    const Bytes original = RandomBytes(300000, 7), packed = Compress(original);
+    auto run = [&](bool compress, std::uint64_t readFails, std::uint64_t writeFails, std::uint32_t stated = 300000) {
+        MemorySource source(compress ? original : packed);
+        source.failAfter = readFails;
         MemorySink sink;
-        EXPECT_EQ(rivzip::ExpandSzdd(source, sink, nullptr), kRivzipReadError) << at;
-    }
-    for (std::uint64_t at : {0, 250000}) {
-        MemorySource source(good);
-        MemorySink sink;
-        sink.failAfter = at;
-        EXPECT_EQ(rivzip::ExpandSzdd(source, sink, nullptr), kRivzipWriteError) << at;
-    }
+        sink.failAfter = writeFails;
+        return compress ? rivzip::CompressSzdd(source, sink, {stated, 0}, nullptr)
+                        : rivzip::ExpandSzdd(source, sink, nullptr);
+    };
+    EXPECT_EQ(run(true, UINT64_MAX, UINT64_MAX, 300001), kRivzipTruncated) << "the source was shorter than stated";
+    EXPECT_EQ(run(true, UINT64_MAX, UINT64_MAX, 299999), kRivzipLengthMismatch) << "and longer";
+    EXPECT_EQ(run(true, 70000, UINT64_MAX), kRivzipReadError);
+    EXPECT_EQ(run(true, UINT64_MAX, 100000), kRivzipWriteError);
+    for (std::uint64_t at : {0, 10, 70000, 200000}) EXPECT_EQ(run(false, at, UINT64_MAX), kRivzipReadError) << at;
+    for (std::uint64_t at : {0, 250000}) EXPECT_EQ(run(false, UINT64_MAX, at), kRivzipWriteError) << at;
 }
 
-TEST(SzddExpander, ReportsStartOneReportPerBlockAndEnd) {
-    for (std::uint32_t size : {0u, 1u, 1024u, 66560u, 400000u}) {
-        Bytes szdd = Compress(TextLike(size, 17));
-        MemorySource source(szdd);
-        MemorySink sink;
+// Both directions report over the original: a start, one report per block and an end. A failed
+// expansion still ends what it started; a file that is no SZDD starts nothing.
+TEST(SzddCodec, ReportsStartOneReportPerBlockAndEnd) {
+    for (std::uint32_t size : {0u, 1u, 1024u, 66560u, 300001u}) {
+        const Bytes original = TextLike(size, 17);
+        MemorySource source(original);
+        MemorySink packed, expanded;
         Reports().clear();
-        std::int32_t result = rivzip::ExpandSzdd(source, sink, &Record);
-        ASSERT_EQ(result, static_cast<std::int32_t>(size));
-        ExpectWellFormedReports(size, size, result);
-        EXPECT_EQ(Reports().back().bytesRead, szdd.size());
+        ExpectWellFormedReports(size, size, rivzip::CompressSzdd(source, packed, {size, 0}, &Record));
+        EXPECT_EQ(Reports().back().operation, kRivzipOperationCompress);
+        EXPECT_EQ(Reports().back().bytesWritten, packed.data.size());
+
+        MemorySource szdd(packed.data);
+        Reports().clear();
+        ASSERT_EQ(rivzip::ExpandSzdd(szdd, expanded, &Record), static_cast<std::int32_t>(size));
+        ExpectWellFormedReports(size, size, static_cast<std::int32_t>(size));
+        EXPECT_EQ(Reports().back().bytesRead, packed.data.size());
     }
-    // A failure still ends what it started; a file that is no SZDD starts nothing.
     Bytes cut = Compress(TextLike(10000, 18));
     cut.resize(cut.size() / 2);
     Bytes notSzdd(100, 'x');

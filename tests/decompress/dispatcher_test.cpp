@@ -1,18 +1,125 @@
-// The dispatcher by compression code, and downloads expanded in place: SZDD through Rivzip.dll,
-// zlib and gzip through zlib; a download that cannot be expanded stays as it arrived, and one
-// expanded by a run that ended before recording it is recognised.
+// The decompression dispatcher: where it finds Rivzip.dll (the program sits apart from the built
+// modules, so only the copies that a test places are found), what it logs on the way; the
+// dispatch by compression code and downloads expanded in place, SZDD through Rivzip.dll, zlib
+// and gzip through zlib; and which of the library's progress reports reach the host's callback.
+#include <gtest/gtest.h>
 #include <zlib.h>
 
+#include <filesystem>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "decompress/decompression_objects.h"
 #include "decompress/expansion_record.h"
 #include "platform/cfile.h"
 #include "platform/errors.h"
 #include "platform/fault.h"
 #include "platform/files.h"
+#include "platform/paths.h"
+#include "platform/registry.h"
+#include "rivzip/compress_performance.h"
 #include "rivzip/file_operations.h"
-#include "tests/decompress/decompress_test_support.h"
+#include "tests/support/test_machine.h"
+#include "tests/support/test_registry.h"
+#include "tests/support/trace_capture.h"
 
-namespace dectest {
 namespace {
+
+using Lines = std::vector<std::string>;
+
+// The built Rivzip.dll and a module that lacks its entry (set by tests/decompress.cmake).
+constexpr char kRivzipModule[] = PEX_RIVZIP_DLL;
+constexpr char kModuleWithoutEntry[] = PEX_MODULE_WITHOUT_ENTRY;
+
+class DecompressTest : public ::testing::Test {
+protected:
+    void TearDown() override { CDecompressionObjects().Unload(); }
+
+    void Place(const char* hostModule, const std::string& winPath) {
+        const std::filesystem::path target = plat::paths::ToHost(winPath);
+        std::filesystem::create_directories(target.parent_path());
+        std::filesystem::copy_file(hostModule, target, std::filesystem::copy_options::overwrite_existing);
+    }
+
+    pextest::TestMachine machine_;
+    pextest::TraceCapture trace_;
+};
+
+constexpr char kKey[] = "SOFTWARE\\Vantric\\ZENDOR32";
+const std::string kFolder1 = "c:\\program files\\vantric\\orlandel\\";
+const std::string kFolder2 = kFolder1 + "shared\\";
+const std::string kInit = "CDecompressionObjects::Load, Initializing";
+const std::string kReg = "CDecompressionObjects::GetRegistryPath";
+const std::string kFound = "CDecompressionObjects::Load, decompress function found for LZW";
+const std::string kPath1 = "CDecompressionObjects::GetDefaultPath1", kPath2 = "CDecompressionObjects::GetDefaultPath2",
+                  kPath3 = "CDecompressionObjects::GetDefaultPath3";
+
+using LibraryLocation = DecompressTest;
+
+TEST_F(LibraryLocation, NothingToLoadIsLoggedAndTriedAgainAtTheNextLzwExpansion) {
+    CDecompressionObjects dispatcher;
+    const Lines attempt = {kInit, kReg, kReg + ", Unable to access registry, RegOpenKeyEx returns 2", kPath1, kPath2,
+                           kPath3, "CDecompressionObjects::Load, Unable to load Rivzip.dll"};
+    EXPECT_EQ(trace_.Lines(), attempt);
+    trace_.Clear();
+    EXPECT_FALSE(dispatcher.DecompressLZW("C:\\app.ex_", nullptr));
+    Lines again = {"CDecompressionObjects::DecompressLZW, file is C:\\app.ex_"};
+    again.insert(again.end(), attempt.begin(), attempt.end());
+    again.push_back("CDecompressionObjects::DecompressLZW, no function pointer for this decompress type");
+    again.push_back("CDecompressionObjects::DecompressLZW, returning 0");
+    EXPECT_EQ(trace_.Lines(), again);
+}
+
+TEST_F(LibraryLocation, WithoutValueOrDefaultFoldersTheCurrentFolderServesBeforeTheSearch) {
+    pextest::CreateRegKey(plat::reg::kLocalMachine, kKey);  // the key, but no "path"
+    Place(kRivzipModule, "C:\\Rivzip.dll");                 // C:\ is the current folder
+    CDecompressionObjects dispatcher;
+    EXPECT_EQ(trace_.Lines(), (Lines{kInit, kReg, kReg + ", Unable to access registry, RegQueryValueEx returns 2",
+                                     kPath1, kPath2, kPath3, kFound}));
+    EXPECT_EQ(CDecompressionObjects::LoadedFrom(), ".\\Rivzip.dll") << "the fourth candidate, not the bare name";
+
+    trace_.Clear();
+    dispatcher.Unload();
+    EXPECT_EQ(trace_.Lines(), (Lines{"CDecompressionObjects::Unload", "CDecompressionObjects::Unload, nulling function pointer",
+                                     "CDecompressionObjects::Unload, FreeLibrary succeeded"}));
+    EXPECT_FALSE(CDecompressionObjects::IsLoaded());
+}
+
+TEST_F(LibraryLocation, TheRegistryValueNamesTheFolderWhenItIsText) {
+    Place(kRivzipModule, "C:\\Tools\\Rivzip.dll");
+    Place(kRivzipModule, kFolder2 + "Rivzip.dll");
+    pextest::SetRegText(plat::reg::kLocalMachine, kKey, "path", "C:\\Tools");
+    {
+        CDecompressionObjects dispatcher;
+        EXPECT_EQ(trace_.Lines(), (Lines{kInit, kReg, kFound}));
+        EXPECT_EQ(CDecompressionObjects::LoadedFrom(), "C:\\Tools\\Rivzip.dll");
+        dispatcher.Unload();
+    }
+
+    // The same text as REG_EXPAND_SZ is refused: the size query's own result, 0, is logged.
+    pextest::SetRegValue(plat::reg::kLocalMachine, kKey, "path", plat::reg::kRegExpandSz, std::string("C:\\Tools", 9));
+    trace_.Clear();
+    CDecompressionObjects dispatcher;
+    EXPECT_EQ(trace_.Lines(), (Lines{kInit, kReg, kReg + ", Unable to access registry, RegQueryValueEx returns 0",
+                                     kPath1, kPath2, kFound}));
+    EXPECT_EQ(CDecompressionObjects::LoadedFrom(), kFolder2 + "Rivzip.dll");
+}
+
+TEST_F(LibraryLocation, ALibraryWithoutTheEntryStaysLoadedAndEveryLzwExpansionFails) {
+    Place(kModuleWithoutEntry, kFolder1 + "Rivzip.dll");
+    machine_.WriteFile("C:\\app.ex_", "SZDD data");
+    CDecompressionObjects dispatcher;
+    EXPECT_TRUE(trace_.Contains("CDecompressionObjects::Load, no decompress function found for LZW"));
+    trace_.Clear();
+    EXPECT_FALSE(dispatcher.DecompressLZW("C:\\app.ex_", nullptr));
+    EXPECT_FALSE(dispatcher.DecompressLZW("C:\\app.ex_", nullptr));
+    const std::string one = "CDecompressionObjects::DecompressLZW, file is C:\\app.ex_\n"
+                            "CDecompressionObjects::DecompressLZW, no function pointer for this decompress type\n"
+                            "CDecompressionObjects::DecompressLZW, returning 0\n";
+    EXPECT_EQ(trace_.Text(), one + one) << "loaded already: no second attempt";
+    EXPECT_EQ(machine_.ReadFile("C:\\app.ex_"), "SZDD data");
+}
 
 constexpr char kPath[] = "C:\\dl\\app.exe";
 constexpr char kStaging[] = "C:\\dl\\app.exe.$new$";
@@ -192,5 +299,28 @@ TEST_F(InPlaceExpansion, DamagedStreamsNeverGiveWrongData) {
     }
 }
 
+// A start, 6000 further reports and an end: the start reaches the callback twice (total, then
+// done), the 2500th and 5000th further report once each, and the end once, with the total.
+TEST(ExpandProgress, PassesTheStartTheEndAndEvery2500thReport) {
+    static std::vector<std::pair<std::int32_t, std::int32_t>> seen;  // item total, item done at each call
+    g_ProgressData = CProgressData();
+    CDecompressionObjects::SetProgressCallback([](CProgressData* progress) {
+        seen.emplace_back(progress->ItemTotal, progress->ItemDone);
+        return false;  // a refusal that the library never hears of
+    });
+    const auto send = [](std::uint32_t processed, bool starting, bool ending) {
+        SCompressPerformance record{};
+        record.processed = processed;
+        record.total = 6001 * 8;
+        record.starting = starting;
+        record.ending = ending;
+        CDecompressionObjects::ExpandProgress(record);
+    };
+    send(0, true, false);
+    for (std::uint32_t n = 1; n <= 6000; ++n) send(n * 8, false, false);
+    send(12345, false, true);
+    CDecompressionObjects::SetProgressCallback(nullptr);
+    EXPECT_EQ(seen, (decltype(seen){{6001, 0}, {6001, 0}, {6001, 2500}, {6001, 5000}, {6001, 6001}}));
+}
+
 }  // namespace
-}  // namespace dectest
