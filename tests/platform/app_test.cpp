@@ -7,6 +7,7 @@
 
 #include "platform/registry.h"
 #include "tests/support/test_machine.h"
+#include "tests/support/test_registry.h"
 
 namespace {
 
@@ -33,18 +34,14 @@ PEX_APPLICATION(CountingApp, theApp);
 
 namespace {
 
-TEST(AppTest, ModuleApplicationStartedAtLoadAndIsCurrent) {
+// This program's application object was started when it was loaded; another one does not
+// replace it as the current one. Hooks run InitInstance and ExitInstance and swallow exceptions.
+TEST(AppTest, StartedAtLoadAndHooksRunInitAndExitSwallowingExceptions) {
     EXPECT_EQ(theApp.initCalls, 1);
     EXPECT_EQ(theApp.exitCalls, 0);
     EXPECT_TRUE(theApp.Initialized());
-    EXPECT_EQ(plat::AfxGetApp(), &theApp);
-
-    CountingApp another;  // a module has one application object: the first stays current
-    EXPECT_EQ(plat::AfxGetApp(), &theApp);
-}
-
-TEST(AppTest, HooksRunInitAndExitAndSwallowExceptions) {
     CountingApp app;
+    EXPECT_EQ(plat::AfxGetApp(), &theApp);
     {
         plat::AppHooks hooks(app);
         EXPECT_EQ(app.initCalls, 1);
@@ -61,34 +58,20 @@ TEST(AppTest, HooksRunInitAndExitAndSwallowExceptions) {
     EXPECT_EQ(app.exitCalls, 2);
 }
 
-class ProfileTest : public ::testing::Test {
-protected:
-    void SetUp() override {
-        plat::reg::Key key;
-        ASSERT_EQ(plat::reg::CreateKey(plat::reg::kCurrentUser, "Software\\Vantric\\Mendler\\Settings",
-                                       plat::reg::kKeyAllAccess, key.out(), nullptr),
-                  0);
-        Set(key, "UBranch", plat::reg::kRegSz, std::string("release\0", 8));
-        Set(key, "PBranch", plat::reg::kRegSz, "beta");  // stored without its NUL
-        Set(key, "Expanded", plat::reg::kRegExpandSz, std::string("%TEMP%\0", 7));
-        Set(key, "PromptThreshold", plat::reg::kRegDword, std::string("\x05\0\0\0", 4));
-    }
-    static void Set(const plat::reg::Key& key, const std::string& name, std::uint32_t type,
-                    const std::string& data) {
-        ASSERT_EQ(plat::reg::SetValue(key.get(), name, type, reinterpret_cast<const std::uint8_t*>(data.data()),
-                                      static_cast<std::uint32_t>(data.size())),
-                  0);
-    }
+// Texts are read with or without their NUL, without regard to case; what is missing or not a
+// text gives the default.
+TEST(AppTest, ProfileStringsComeFromTheRegistryProfile) {
     pextest::TestMachine m;
-};
-
-TEST_F(ProfileTest, ReadsStringEntriesOfTheApplicationProfile) {
+    const auto set = [](const char* name, std::uint32_t type, const std::string& bytes) {
+        pextest::SetRegValue(plat::reg::kCurrentUser, "Software\\Vantric\\Mendler\\Settings", name, type, bytes);
+    };
+    set("UBranch", plat::reg::kRegSz, std::string("release\0", 8));
+    set("PBranch", plat::reg::kRegSz, "beta");
+    set("Expanded", plat::reg::kRegExpandSz, std::string("%TEMP%\0", 7));
+    set("PromptThreshold", plat::reg::kRegDword, std::string("\x05\0\0\0", 4));
     EXPECT_EQ(theApp.GetProfileString("Settings", "UBranch", "x"), "release");
     EXPECT_EQ(theApp.GetProfileString("settings", "pbranch", "x"), "beta");
     EXPECT_EQ(theApp.GetProfileString("Settings", "Expanded"), "%TEMP%");
-}
-
-TEST_F(ProfileTest, GivesTheDefaultForWhatIsMissingOrNotAString) {
     EXPECT_EQ(theApp.GetProfileString("Settings", "Missing", "fallback"), "fallback");
     EXPECT_EQ(theApp.GetProfileString("Nowhere", "UBranch", "fallback"), "fallback");
     EXPECT_EQ(theApp.GetProfileString("Settings", "PromptThreshold", "10"), "10");

@@ -37,7 +37,7 @@ protected:
     pextest::TestMachine m;
 };
 
-TEST_F(CFileTest, WritesReadsAndSeeksByWindowsPath) {
+TEST_F(CFileTest, WritesReadsSeeksAndTruncatesByWindowsPath) {
     {
         CFile out;
         ASSERT_TRUE(out.Open("C:\\APP\\new.bin", kCreateWrite));
@@ -57,18 +57,15 @@ TEST_F(CFileTest, WritesReadsAndSeeksByWindowsPath) {
     EXPECT_EQ(std::string(buffer, 5), "WORLD");
     EXPECT_EQ(in.Read(buffer, sizeof buffer), 0u);  // at the end
     EXPECT_THROW(in.Seek(-100, CFile::current), CFileException);
-}
 
-TEST_F(CFileTest, CreateTruncatesUnlessNoTruncate) {
+    // Create empties an existing file, unless told not to.
     CFile keep;
     ASSERT_TRUE(keep.Open("C:\\app\\data.bin",
                           CFile::modeCreate | CFile::modeNoTruncate | CFile::modeReadWrite | CFile::shareDenyNone));
     EXPECT_EQ(keep.GetLength(), 10u);
     keep.Close();
-
-    CFile fresh;
-    ASSERT_TRUE(fresh.Open("C:\\app\\data.bin", kCreateWrite));
-    EXPECT_EQ(fresh.GetLength(), 0u);
+    ASSERT_TRUE(keep.Open("C:\\app\\data.bin", kCreateWrite));
+    EXPECT_EQ(keep.GetLength(), 0u);
 }
 
 TEST_F(CFileTest, OpenReportsWindowsCodes) {
@@ -116,7 +113,7 @@ TEST_F(CFileTest, ShareModesLetCompatibleOpenersIn) {
     EXPECT_TRUE(plat::files::Copy("C:\\app\\data.bin", "C:\\app\\copy.bin", false));
 }
 
-TEST_F(CFileTest, RefusedWriteThrowsTheCodeAndWritesNothing) {
+TEST_F(CFileTest, RefusedWritesAndClosedFilesThrow) {
     CFile out;
     ASSERT_TRUE(out.Open("C:\\app\\out.bin", kCreateWrite));
     out.Write("ab", 2);
@@ -131,15 +128,11 @@ TEST_F(CFileTest, RefusedWriteThrowsTheCodeAndWritesNothing) {
     out.Write("ef", 2);  // only the first write after the rule fails
     out.Close();
     EXPECT_EQ(m.ReadFile("C:\\app\\out.bin"), "abef");
-}
-
-TEST_F(CFileTest, OperationsOnAClosedFileThrow) {
-    CFile file;
     char byte;
-    EXPECT_THROW(file.Read(&byte, 1), CFileException);
-    EXPECT_THROW(file.Write("x", 1), CFileException);
-    EXPECT_THROW(file.GetLength(), CFileException);
-    EXPECT_NO_THROW(file.Close());
+    EXPECT_THROW(out.Read(&byte, 1), CFileException);  // a closed file
+    EXPECT_THROW(out.Write("x", 1), CFileException);
+    EXPECT_THROW(out.GetLength(), CFileException);
+    EXPECT_NO_THROW(out.Close());
 }
 
 }  // namespace

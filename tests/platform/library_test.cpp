@@ -1,18 +1,17 @@
 // Libraries: the Windows search order for bare names, exports (with the undecorated fallback
 // for MSVC-decorated names) and the failures Windows reports. The test modules are built
-// beside this test program: PexSelfReg.dll, PexNoSelfReg.dll, PexNoVersion.dll.
+// beside this test program: PexSelfReg.dll, PexNoSelfReg.dll, PexNoVersion.dll. Calling a
+// module's DllRegisterServer is tested through [REGSVR] (command_executors_test.cpp).
 #include "platform/library.h"
 
 #include <gtest/gtest.h>
 
-#include <cstdint>
 #include <filesystem>
 #include <string>
 
 #include "platform/errors.h"
 #include "platform/files.h"
 #include "platform/paths.h"
-#include "platform/registry.h"
 #include "tests/support/test_machine.h"
 
 namespace {
@@ -60,7 +59,7 @@ TEST(Library, BareNamesFollowTheSearchOrder) {
     EXPECT_EQ(again.get(), byPath.get());
 }
 
-TEST(Library, ExportsAndTheUndecoratedFallback) {
+TEST(Library, ExportsTheUndecoratedFallbackAndLoadFailures) {
     pextest::TestMachine m;
     Library lib(plat::lib::Load("PexNoVersion.dll"));
     ASSERT_TRUE(lib);
@@ -71,31 +70,7 @@ TEST(Library, ExportsAndTheUndecoratedFallback) {
     EXPECT_EQ(plat::LastError(), 127u);
     // Only the module's own exports count, not those of what it links against.
     EXPECT_EQ(plat::lib::FindExport(lib.get(), "malloc"), nullptr);
-}
 
-TEST(Library, SelfRegisteringModuleRuns) {
-    pextest::TestMachine m;
-    Library lib(plat::lib::Load("PexSelfReg.dll"));
-    ASSERT_TRUE(lib);
-    auto reg = reinterpret_cast<std::int32_t (*)()>(plat::lib::FindExport(lib.get(), "DllRegisterServer"));
-    ASSERT_NE(reg, nullptr);
-    EXPECT_EQ(reg(), 0);
-    lib.Reset();
-
-    plat::reg::Key key;
-    ASSERT_EQ(plat::reg::OpenKey(plat::reg::kLocalMachine, "Software\\Vantric\\Test", plat::reg::kKeyRead,
-                                 key.out()),
-              0);
-    std::uint32_t value = 0, size = sizeof value, type = 0;
-    ASSERT_EQ(plat::reg::QueryValue(key.get(), "Registered", &type, reinterpret_cast<std::uint8_t*>(&value),
-                                    &size),
-              0);
-    EXPECT_EQ(type, plat::reg::kRegDword);
-    EXPECT_EQ(value, 1u);
-}
-
-TEST(Library, LoadFailures) {
-    pextest::TestMachine m;
     EXPECT_EQ(plat::lib::Load(""), nullptr);
     EXPECT_EQ(plat::LastError(), 126u);
     EXPECT_EQ(plat::lib::Load("nosuch.dll"), nullptr);

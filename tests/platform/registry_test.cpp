@@ -1,5 +1,5 @@
-// The registry of the machine: the codes of the Windows calls, names and order, the
-// read-only registry, several processes, batches and the fault plan.
+// The registry of the machine: the codes of the Windows calls, names and order, the read-only
+// registry and several processes. Batches are tested through .reg imports (reg_file_test.cpp).
 #include "platform/registry.h"
 
 #include <gtest/gtest.h>
@@ -9,14 +9,10 @@
 #include <unistd.h>
 #endif
 
-#include <algorithm>
 #include <string>
 #include <vector>
 
 #include "platform/errors.h"
-#include "platform/fault.h"
-#include "platform/machine.h"
-#include "platform/reg_transaction.h"
 #include "tests/support/platform_guard.h"
 #include "tests/support/test_machine.h"
 
@@ -26,8 +22,6 @@ namespace {
 
 class RegistryTest : public ::testing::Test {
 protected:
-    void TearDown() override { plat::fault::Clear(); }
-
     reg::Key Create(const std::string& path, std::uint32_t access = reg::kKeyAllAccess) {
         reg::Key key;
         EXPECT_EQ(0, reg::CreateKey(reg::kLocalMachine, path, access, key.out(), nullptr));
@@ -100,47 +94,39 @@ TEST_F(RegistryTest, SubkeysEnumerateInCaseInsensitiveOrderKeepingTheirCase) {
     EXPECT_EQ(0u, values);
 }
 
-TEST_F(RegistryTest, ValueNamesMatchWithoutCaseAndKeepTheCaseTheyWereCreatedWith) {
-    reg::Key key = Create("Software\\Names");
+// Value names match without regard to case and keep the case they were created with; texts
+// are stored exactly as given, with or without their NUL.
+TEST_F(RegistryTest, ValuesKeepTheirFirstNameAndTheBytesAsWritten) {
+    reg::Key key = Create("Software\\Values");
     ASSERT_EQ(0, SetText(key.get(), "ContentFileName", std::string("a.csv", 6)));
     ASSERT_EQ(0, SetText(key.get(), "CONTENTFILENAME", std::string("b.csv", 6)));
     EXPECT_EQ(std::string("b.csv", 6), Text(key.get(), "contentfilename"));
-
-    char name[64];
-    std::uint32_t nameSize = sizeof name, type = 0, dataSize = 0;
-    ASSERT_EQ(0, reg::EnumValue(key.get(), 0, name, &nameSize, &type, nullptr, &dataSize));
-    EXPECT_STREQ("ContentFileName", name);
-    EXPECT_EQ(reg::kRegSz, type);
-    EXPECT_EQ(6u, dataSize);
-    nameSize = sizeof name;
-    EXPECT_EQ(259, reg::EnumValue(key.get(), 1, name, &nameSize, nullptr, nullptr, nullptr));
-}
-
-TEST_F(RegistryTest, QueryValueGivesSizesAndTheBytesAsWritten) {
-    reg::Key key = Create("Software\\Sizes");
-    ASSERT_EQ(0, SetText(key.get(), "WithNul", std::string("abc", 4)));
     ASSERT_EQ(0, SetText(key.get(), "WithoutNul", "abc"));
     ASSERT_EQ(0, SetText(key.get(), "Empty", ""));
 
-    std::uint32_t type = 0, size = 0;
-    EXPECT_EQ(0, reg::QueryValue(key.get(), "WithNul", &type, nullptr, &size));
-    EXPECT_EQ(4u, size);
+    char name[64];
+    std::uint32_t nameSize = sizeof name, type = 0, size = 0;
+    ASSERT_EQ(0, reg::EnumValue(key.get(), 0, name, &nameSize, &type, nullptr, &size));
+    EXPECT_STREQ("ContentFileName", name);
     EXPECT_EQ(reg::kRegSz, type);
+    EXPECT_EQ(6u, size);
+    nameSize = sizeof name;
+    EXPECT_EQ(259, reg::EnumValue(key.get(), 3, name, &nameSize, nullptr, nullptr, nullptr));
     EXPECT_EQ("abc", Text(key.get(), "WithoutNul"));
     EXPECT_EQ(0, reg::QueryValue(key.get(), "Empty", nullptr, nullptr, &size));
     EXPECT_EQ(0u, size);
 
     std::uint8_t small[2];
     size = sizeof small;
-    EXPECT_EQ(234, reg::QueryValue(key.get(), "WithNul", &type, small, &size));
-    EXPECT_EQ(4u, size);
+    EXPECT_EQ(234, reg::QueryValue(key.get(), "ContentFileName", &type, small, &size));
+    EXPECT_EQ(6u, size);
     EXPECT_EQ(234u, plat::LastError());
 
     EXPECT_EQ(2, reg::QueryValue(key.get(), "Missing", nullptr, nullptr, &size));
     EXPECT_EQ(2, reg::DeleteValue(key.get(), "Missing"));
-    EXPECT_EQ(0, reg::DeleteValue(key.get(), "withnul"));
+    EXPECT_EQ(0, reg::DeleteValue(key.get(), "contentFILEname"));
     EXPECT_EQ(0u, plat::LastError());
-    EXPECT_EQ("<missing>", Text(key.get(), "WithNul"));
+    EXPECT_EQ("<missing>", Text(key.get(), "ContentFileName"));
 }
 
 TEST_F(RegistryTest, AccessRightsAndKeyDeletionFollowWindows) {
@@ -163,19 +149,6 @@ TEST_F(RegistryTest, AccessRightsAndKeyDeletionFollowWindows) {
     EXPECT_EQ(2, reg::DeleteKey(reg::kLocalMachine, "Software\\Vantric\\Pex\\Zendor32"));
     EXPECT_EQ(0, reg::DeleteKey(readOnly.get(), "Pex"));
     EXPECT_EQ(5, reg::DeleteKey(reg::kCurrentUser, ""));  // a hive stays
-}
-
-TEST_F(RegistryTest, ClassesRootIsAViewOfTheMachineClasses) {
-    reg::Key viaView;
-    ASSERT_EQ(0, reg::CreateKey(reg::kClassesRoot, ".pex", reg::kKeyAllAccess, viaView.out(),
-                                nullptr));
-    ASSERT_EQ(0, SetText(viaView.get(), "", "Pex.File"));
-    reg::Key direct;
-    ASSERT_EQ(0, reg::OpenKey(reg::kLocalMachine, "Software\\Classes\\.PEX", reg::kKeyRead,
-                              direct.out()));
-    EXPECT_EQ("Pex.File", Text(direct.get(), ""));
-    const std::vector<std::string> classes = SubKeys(reg::kClassesRoot);
-    EXPECT_NE(std::find(classes.begin(), classes.end(), ".pex"), classes.end());
 }
 
 TEST_F(RegistryTest, ARegistryThatCannotBeWrittenStillReads) {
@@ -238,37 +211,6 @@ TEST_F(RegistryTest, ProcessesWritingAtOnceLoseNothing) {
     EXPECT_EQ(std::uint32_t(kProcesses * kWrites), subKeys);
     EXPECT_EQ(std::uint32_t(kProcesses * kWrites), values);
 #endif
-}
-
-TEST_F(RegistryTest, TheFaultPlanFailsTheChosenRegistryWrite) {
-    reg::Key key = Create("Software\\Faults");
-    plat::fault::FailNth(plat::fault::Op::RegWrite, 2, plat::kErrorDiskFull);
-    EXPECT_EQ(0, SetText(key.get(), "first", "1"));
-    EXPECT_EQ(112, SetText(key.get(), "second", "2"));
-    EXPECT_EQ(112u, plat::LastError());
-    EXPECT_EQ(0, SetText(key.get(), "third", "3"));
-    EXPECT_EQ("<missing>", Text(key.get(), "second"));
-    EXPECT_EQ("3", Text(key.get(), "third"));
-}
-
-TEST_F(RegistryTest, ABatchTakesEffectWholeOrNotAtAll) {
-    reg::Key key = Create("Software\\Batch");
-    {
-        reg::Transaction batch;
-        ASSERT_EQ(0, batch.Status());
-        ASSERT_EQ(0, SetText(key.get(), "dropped", "x"));
-        reg::Key child;
-        ASSERT_EQ(0, reg::CreateKey(key.get(), "DroppedKey", reg::kKeyAllAccess, child.out(),
-                                    nullptr));
-    }
-    EXPECT_EQ("<missing>", Text(key.get(), "dropped"));
-    EXPECT_TRUE(SubKeys(key.get()).empty());
-    {
-        reg::Transaction batch;
-        ASSERT_EQ(0, SetText(key.get(), "kept", "y"));
-        EXPECT_EQ(0, batch.Commit());
-    }
-    EXPECT_EQ("y", Text(key.get(), "kept"));
 }
 
 TEST_F(RegistryTest, HandlesBelongToTheirMachine) {

@@ -16,6 +16,7 @@
 #include "platform/registry.h"
 #include "tests/support/platform_guard.h"
 #include "tests/support/test_machine.h"
+#include "tests/support/test_registry.h"
 
 namespace {
 
@@ -24,31 +25,14 @@ using plat::setup::PendingRename;
 
 constexpr std::uint32_t kStyle = plat::setup::kCopySourceAbsolute | plat::setup::kCopyInUseNeedsReboot;
 
-// Holds a file in use, as a program that has it open without sharing does.
-class InUse {
-public:
-    explicit InUse(const std::string& winPath) {
-        EXPECT_TRUE(file_.Open(winPath, plat::CFile::modeRead | plat::CFile::shareExclusive));
-    }
-    void Release() { file_.Close(); }
+// How a program holds a file in use: open without sharing.
+constexpr unsigned kHeld = plat::CFile::modeRead | plat::CFile::shareExclusive;
 
-private:
-    plat::CFile file_;
-};
-
-// The stored value: type and bytes.
+// The stored queue's bytes, or "<none>".
 std::string StoredQueue(std::uint32_t* type) {
-    plat::reg::Key key;
-    if (plat::reg::OpenKey(plat::reg::kLocalMachine, plat::setup::kSessionManagerKey, plat::reg::kKeyRead,
-                           key.out()) != 0)
-        return "<no key>";
-    std::uint32_t size = 0;
-    if (plat::reg::QueryValue(key.get(), plat::setup::kPendingRenamesValue, type, nullptr, &size) != 0)
-        return "<no value>";
-    std::string data(size, '\0');
-    plat::reg::QueryValue(key.get(), plat::setup::kPendingRenamesValue, type,
-                          reinterpret_cast<std::uint8_t*>(data.data()), &size);
-    return data;
+    std::string bytes;
+    return pextest::GetRegValue(plat::reg::kLocalMachine, plat::setup::kSessionManagerKey,
+                                plat::setup::kPendingRenamesValue, &bytes, type) ? bytes : "<none>";
 }
 
 long Boot() {
@@ -60,18 +44,6 @@ long Boot() {
     return static_cast<long>(code);
 }
 
-TEST(SetupInstall, FreeTargetIsInstalledAtOnce) {
-    pextest::TestMachine m;
-    m.WriteFile("C:\\dl\\new.dll", "new");
-    m.WriteFile("C:\\app\\a.dll", "old");
-    bool inUse = true;
-    ASSERT_TRUE(plat::setup::InstallFile("C:\\dl\\new.dll", "C:\\app\\a.dll", kStyle, &inUse));
-    EXPECT_FALSE(inUse);
-    EXPECT_EQ(m.ReadFile("C:\\app\\a.dll"), "new");
-    std::uint32_t type = 0;
-    EXPECT_EQ(StoredQueue(&type).rfind("<no ", 0), 0u);  // no queue stored
-}
-
 TEST(SetupInstall, TargetInUseIsQueuedAndCarriedOutAtBoot) {
     PEX_NOT_UNDER_WINE(pextest::kWineSetupApi);
     pextest::TestMachine m;
@@ -79,7 +51,8 @@ TEST(SetupInstall, TargetInUseIsQueuedAndCarriedOutAtBoot) {
     m.WriteFile("C:\\dl\\b1.dll", "new b");
     m.WriteFile("C:\\app\\a.dll", "old a");
     m.WriteFile("C:\\app\\b.dll", "old b");
-    InUse lockA("C:\\app\\a.dll"), lockB("C:\\app\\b.dll");
+    plat::CFile lockA, lockB;
+    ASSERT_TRUE(lockA.Open("C:\\app\\a.dll", kHeld) && lockB.Open("C:\\app\\b.dll", kHeld));
 
     bool inUse = false;
     ASSERT_TRUE(plat::setup::InstallFile("C:\\dl\\a1.dll", "C:\\app\\a.dll", kStyle, &inUse));
@@ -98,14 +71,14 @@ TEST(SetupInstall, TargetInUseIsQueuedAndCarriedOutAtBoot) {
                                       "\\??\\" + stagedB + '\0' + "!\\??\\C:\\app\\b.dll" + '\0' + '\0');
     EXPECT_EQ(type, plat::reg::kRegMultiSz);
 
-    lockA.Release();
-    lockB.Release();
+    lockA.Close();
+    lockB.Close();
     EXPECT_EQ(m.ReadFile("C:\\app\\a.dll"), "old a");
     EXPECT_EQ(Boot(), 0);
     EXPECT_EQ(m.ReadFile("C:\\app\\a.dll"), "new a");
     EXPECT_EQ(m.ReadFile("C:\\app\\b.dll"), "new b");
     EXPECT_FALSE(plat::files::Exists(stagedA));
-    EXPECT_EQ(StoredQueue(&type), "<no value>");
+    EXPECT_EQ(StoredQueue(&type), "<none>");
 }
 
 TEST(SetupInstall, FailedRenameStaysQueuedAndNothingElseIsLost) {
@@ -125,22 +98,31 @@ TEST(SetupInstall, FailedRenameStaysQueuedAndNothingElseIsLost) {
     EXPECT_EQ(StoredQueue(&type), "\\??\\C:\\app\\gone.tmp\0!\\??\\C:\\app\\a.dll\0\0"s);
 }
 
-TEST(SetupInstall, OtherFailuresAreReported) {
+// A free target is installed at once and nothing is queued; failures give the Windows codes.
+TEST(SetupInstall, FreeTargetIsInstalledAtOnceAndFailuresAreReported) {
     pextest::TestMachine m;
     m.WriteFile("C:\\dl\\new.dll", "new");
-    m.WriteFile("C:\\app\\ro.dll", "old");
-    ASSERT_TRUE(plat::files::SetAttributes("C:\\app\\ro.dll", plat::files::kAttrReadOnly));
+    m.WriteFile("C:\\app\\a.dll", "old");
     bool inUse = true;
+    ASSERT_TRUE(plat::setup::InstallFile("C:\\dl\\new.dll", "C:\\app\\a.dll", kStyle, &inUse));
+    EXPECT_FALSE(inUse);
+    EXPECT_EQ(m.ReadFile("C:\\app\\a.dll"), "new");
+    std::uint32_t type = 0;
+    EXPECT_EQ(StoredQueue(&type), "<none>");
+
+    inUse = true;
     EXPECT_FALSE(plat::setup::InstallFile("C:\\dl\\missing.dll", "C:\\app\\x.dll", kStyle, &inUse));
     EXPECT_EQ(plat::LastError(), 2u);
     EXPECT_FALSE(inUse);
-    EXPECT_FALSE(plat::setup::InstallFile("C:\\dl\\new.dll", "C:\\app\\ro.dll", kStyle, &inUse));
+    ASSERT_TRUE(plat::files::SetAttributes("C:\\app\\a.dll", plat::files::kAttrReadOnly));
+    EXPECT_FALSE(plat::setup::InstallFile("C:\\dl\\new.dll", "C:\\app\\a.dll", kStyle, &inUse));
     EXPECT_EQ(plat::LastError(), 5u);
 
     // Without the in-use style a target in use is a plain failure.
-    InUse lock("C:\\app\\ro.dll");
-    ASSERT_TRUE(plat::files::SetAttributes("C:\\app\\ro.dll", plat::files::kAttrNormal));
-    EXPECT_FALSE(plat::setup::InstallFile("C:\\dl\\new.dll", "C:\\app\\ro.dll", 0, &inUse));
+    plat::CFile lock;
+    ASSERT_TRUE(lock.Open("C:\\app\\a.dll", kHeld));
+    ASSERT_TRUE(plat::files::SetAttributes("C:\\app\\a.dll", plat::files::kAttrNormal));
+    EXPECT_FALSE(plat::setup::InstallFile("C:\\dl\\new.dll", "C:\\app\\a.dll", 0, &inUse));
     EXPECT_EQ(plat::LastError(), 32u);
 }
 
