@@ -1,12 +1,12 @@
 // CManifestParser: the apply pipeline: decompression, group application in dependency order with
 // bounded retries and group rollback, status recording in the content file, and cleanup.
-#include <cctype>
 #include <set>
 #include <vector>
 
 #include "decompress/expansion_record.h"
 #include "diag/trace_log.h"
 #include "manifest/manifest_parser.h"
+#include "manifest/name_normalise.h"
 #include "model/upgrade_status.h"
 #include "platform/files.h"
 
@@ -24,12 +24,7 @@ void Step(ProgressCallback callback) {
     callback(&g_ProgressData);
 }
 
-std::string Upper(std::string text) {
-    for (char& c : text) c = static_cast<char>(std::toupper(static_cast<unsigned char>(c)));
-    return text;
-}
-
-// The expansion records (upper-cased paths) in the folders of the master list's downloads:
+// The expansion records (paths as NormaliseName makes them) in the folders of the master list's downloads:
 // one listing per folder instead of a lookup per download, since a lookup of a name that is
 // missing, as nearly all records are, reads the whole folder on the emulated machine.
 std::set<std::string> ExpansionRecordsBeside(CMasterList& masterList) {
@@ -42,7 +37,7 @@ std::set<std::string> ExpansionRecordsBeside(CMasterList& masterList) {
         }
     for (const std::string& folder : folders)
         for (const plat::files::FindEntry& entry : plat::files::Find(ExpansionRecordName(folder + "*")))
-            records.insert(Upper(folder + entry.name));
+            records.insert(NormaliseName(folder + entry.name));
     return records;
 }
 
@@ -73,7 +68,7 @@ void CManifestParser::DecompressFiles(std::int32_t& result, ProgressCallback cal
             // The row says the download is expanded: a record left by a run that ended before
             // it could remove it (below) has done its work.
             if (!file.IsDecompressionNeeded()) {
-                if (records.count(Upper(ExpansionRecordName(file.GetDownLoadCacheFile())))) {
+                if (records.count(NormaliseName(ExpansionRecordName(file.GetDownLoadCacheFile())))) {
                     file.ExpansionRecorded();
                 } else {
                     file.NoExpansionRecord();

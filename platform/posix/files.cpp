@@ -275,11 +275,16 @@ bool CheckTarget(const std::string& host, bool failIfExists, bool* exists, struc
     return MayReplace(host, *st);
 }
 
-bool OpenSource(const std::string& host, struct stat* st, int* fd) {
+// The refusals of reading a file: a folder, or a file whose holder denies reading.
+bool MayRead(const std::string& host, struct stat* st) {
     if (!StatOf(host, st)) return false;
     if (S_ISDIR(st->st_mode)) return Fail(kErrorAccessDenied);
     // Reading is refused only when another opener denies it (an exclusive lock).
-    if (LockedByOther(host, LOCK_SH)) return Fail(kErrorSharingViolation);
+    return !LockedByOther(host, LOCK_SH) || Fail(kErrorSharingViolation);
+}
+
+bool OpenSource(const std::string& host, struct stat* st, int* fd) {
+    if (!MayRead(host, st)) return false;
     *fd = open(host.c_str(), O_RDONLY | O_CLOEXEC);
     return *fd >= 0 || FailErrno(host);
 }
@@ -376,12 +381,8 @@ bool CopyToKeep(const std::string& src, const std::string& dst) {
     if (!fault::Allow(fault::Op::Copy)) return false;
     std::string from, to;
     if (!HostOf(src, &from) || !HostOf(dst, &to)) return false;
-    // The refusals of a copy come first: a source held exclusively cannot be read.
-    struct stat st;
-    if (!StatOf(from, &st)) return false;
-    if (S_ISDIR(st.st_mode)) return Fail(kErrorAccessDenied);
-    if (LockedByOther(from, LOCK_SH)) return Fail(kErrorSharingViolation);
-    struct stat kept;
+    struct stat st, kept;
+    if (!MayRead(from, &st)) return false;  // the refusals of a copy come first
     if (lstat(to.c_str(), &kept) == 0) {
         // Already that very file (an earlier attempt kept it so, and it has not been replaced).
         if (kept.st_ino == st.st_ino && kept.st_dev == st.st_dev) return true;

@@ -1,6 +1,8 @@
 // Key handles of the emulated registry and the walk from a handle to a key row.
 #include "platform/posix/registry_handle.h"
 
+#include <cstring>
+
 #include "platform/errors.h"
 #include "platform/posix/registry_db.h"
 
@@ -79,6 +81,17 @@ long Existing(HKey key, std::uint32_t need, std::int64_t* row) {
 
 HKey NewHandle(std::int64_t row, std::uint32_t access) {
     return new KeyTag{row, access, db::Generation(), false};
+}
+
+long NextName(db::Statement& st, char* name, std::uint32_t* nameSize) {
+    const int rc = st.Step();
+    if (rc == SQLITE_DONE) return kErrorNoMoreItems;
+    if (rc != SQLITE_ROW) return db::ErrorFor(rc);
+    const std::string found = st.Bytes(0);
+    if (!name || *nameSize < found.size() + 1) return kErrorMoreData;
+    std::memcpy(name, found.c_str(), found.size() + 1);
+    *nameSize = static_cast<std::uint32_t>(found.size());
+    return 0;
 }
 
 long Done(long code) {

@@ -5,6 +5,7 @@
 #include <string>
 #include <vector>
 
+#include "platform/posix/registry_db.h"
 #include "platform/registry.h"
 
 namespace plat::reg {
@@ -40,6 +41,10 @@ long Walk(std::int64_t from, const std::vector<std::string>& names, std::int64_t
 long Existing(HKey key, std::uint32_t need, std::int64_t* row);
 
 HKey NewHandle(std::int64_t row, std::uint32_t access);
+
+// Steps an enumeration's query (one row, the name in its first column) and copies the name into
+// the caller's buffer: 259 past the last item, 234 when the buffer is too small.
+long NextName(db::Statement& st, char* name, std::uint32_t* nameSize);
 
 // Sets the thread's last error to code and returns it, as every registry call ends.
 long Done(long code);

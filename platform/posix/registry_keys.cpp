@@ -1,5 +1,4 @@
 // Keys of the emulated registry: open, create, close, delete, enumerate, count.
-#include <cstring>
 
 #include "platform/errors.h"
 #include "platform/posix/registry_db.h"
@@ -97,14 +96,7 @@ long EnumLocked(HKey key, std::uint32_t index, char* name, std::uint32_t* nameSi
     db::Statement st =
         db::Prepare("SELECT name FROM keys WHERE parent = ?1 ORDER BY fold LIMIT 1 OFFSET ?2");
     st.Bind(1, row).Bind(2, static_cast<std::int64_t>(index));
-    int rc = st.Step();
-    if (rc == SQLITE_DONE) return kErrorNoMoreItems;
-    if (rc != SQLITE_ROW) return db::ErrorFor(rc);
-    std::string found = st.Bytes(0);
-    if (!name || *nameSize < found.size() + 1) return kErrorMoreData;
-    std::memcpy(name, found.c_str(), found.size() + 1);
-    *nameSize = static_cast<std::uint32_t>(found.size());
-    return 0;
+    return detail::NextName(st, name, nameSize);
 }
 
 long InfoLocked(HKey key, std::uint32_t* subKeys, std::uint32_t* values) {

@@ -108,13 +108,7 @@ long EnumLocked(HKey key, std::uint32_t index, char* name, std::uint32_t* nameSi
     db::Statement st = db::Prepare(
         "SELECT name, type, data FROM vals WHERE key_id = ?1 ORDER BY seq LIMIT 1 OFFSET ?2");
     st.Bind(1, row).Bind(2, static_cast<std::int64_t>(index));
-    int rc = st.Step();
-    if (rc == SQLITE_DONE) return kErrorNoMoreItems;
-    if (rc != SQLITE_ROW) return db::ErrorFor(rc);
-    std::string found = st.Bytes(0);
-    if (!name || *nameSize < found.size() + 1) return kErrorMoreData;
-    std::memcpy(name, found.c_str(), found.size() + 1);
-    *nameSize = static_cast<std::uint32_t>(found.size());
+    if (long rc = detail::NextName(st, name, nameSize)) return rc;
     return Deliver(st.Int(1), st.Bytes(2), type, data, dataSize);
 }
 
