@@ -187,7 +187,9 @@ void CManifestParser::ApplyGroup(CFileGroup& group, std::int32_t& result, Progre
         for (std::uint32_t row : appliedRows)
             SetField(static_cast<std::int32_t>(row), "UpgradeStatus", UpgradeStatus[kDownloaded]);
     }
-    WriteManifest();
+    // The saved statuses are the commit; the journal learns of it after them, so a run that
+    // ends in between is told by the content file (RecoverEarlierRun).
+    if (WriteManifest() && !groupError) journal_.RecordCommitted(appliedRows);
     TRACE(g_TraceLog, "CManifestParser: b.o.l., Manifest written");
 }
 
@@ -202,27 +204,21 @@ void CManifestParser::CleanUp(std::int32_t result, ProgressCallback callback) {
         TRACE(g_TraceLog, "CManifestParser: ProcessUpdateInformation,  not a complete success, performing needed cleanup");
         WriteManifest();
     }
-    // Backups and downloads go while the content file still names them, and the content file
-    // goes only once they are gone: whatever is left (a run that ends in here, a deletion that
-    // fails) is found by the next run through the rows, which read as applied, and removed
-    // there (RemoveLeftoversOfCommittedRows). Discarded first, nothing would name them again.
+    // Backups and downloads go while the content file still names them and the journal still
+    // holds their rows; what is left (a run that ends in here, a deletion that fails) the next
+    // run's recovery removes, as the journal names it.
     bool cleaned = true;
-    std::set<std::uint32_t> cleanedRows;
-    for (auto& [key, group] : masterList_) {
-        for (CFile_& file : group.GetFiles()) {
-            TRACE(g_TraceLog, "CManifestParser: ProcessUpdateInformation, removing backup file for '%s'",
-                  file.GetFileName().c_str());
-            const bool noBackup = file.RemoveBackupFile();
-            // The download stays while a backup does: it is what proves the backup obsolete.
-            if (!file.IsApplied()) continue;
-            if (noBackup && file.ExpansionRecorded() && file.Remove()) {
-                cleanedRows.insert(file.GetRow());
-            } else {
-                cleaned = false;
-            }
-        }
+    for (auto& [key, group] : masterList_)
+        for (CFile_& file : group.GetFiles()) CleanUpFile(file, &cleaned);
+    // After a complete clean-up all the journal may still hold are downloads that could not be
+    // removed, which no later run would look for once the content file is gone. It goes before
+    // the content file (a run that ends in between discards that again), and keeps it while it
+    // is there, since a later content file of the same name would find it.
+    if (result == 0 && cleaned) {
+        cleaned = journal_.Discard();
+    } else {
+        journal_.Close();  // kept while a row waits for the next run
     }
-    cleaned = RemoveLeftoversOfCommittedRows(cleanedRows) && cleaned;
     if (result != 0) return;
     if (!cleaned) {
         TRACE(g_TraceLog,
@@ -237,19 +233,32 @@ void CManifestParser::CleanUp(std::int32_t result, ProgressCallback callback) {
     Step(callback);
 }
 
-// Rows that read as applied are not admitted, so nothing else would look at what the run that
-// applied them left behind when it ended before its clean-up. False when some of it is left.
-// The rows that this run has just cleaned up after are not looked at again.
-bool CManifestParser::RemoveLeftoversOfCommittedRows(const std::set<std::uint32_t>& cleanedRows) {
-    bool removed = true;
-    for (std::uint32_t row = 0; row < table_.RowCount(); ++row) {
-        if (cleanedRows.count(row) || table_.Field(row, "UpgradeStatus") != UpgradeStatus[kAppliedSuccessfully])
-            continue;
-        const std::string& download = table_.Field(row, "DownLoadCacheFile");
-        if (download.empty() || !plat::files::Exists(download)) continue;
-        CFile_ file(row, true, true, table_.Field(row, "HomeDir"), table_.Field(row, "FileName"), download,
-                    std::string(), std::string(), false, 0);
-        removed = file.RemoveLeftovers() && removed;
+void CManifestParser::CleanUpFile(CFile_& file, bool* cleaned) {
+    TRACE(g_TraceLog, "CManifestParser: ProcessUpdateInformation, removing backup file for '%s'",
+          file.GetFileName().c_str());
+    const bool noBackup = file.RemoveBackupFile();
+    // The download stays while a backup does: the row's journal records name both.
+    if (!file.IsApplied()) return;
+    if (!noBackup || !file.ExpansionRecorded()) {
+        *cleaned = false;
+        return;
     }
-    return removed;
+    // A download that cannot be removed costs disk space, not the update: it does not keep the
+    // content file. While the content file stays, the journal still names it for the next run.
+    if (!file.Remove()) {
+        TRACE(g_TraceLog, "CManifestParser: ProcessUpdateInformation, unable to remove download '%s', left in place",
+              file.GetDownLoadCacheFile().c_str());
+        return;
+    }
+    *cleaned = journal_.RecordCleaned(file.GetRow()) && *cleaned;
+}
+
+std::uint32_t CManifestParser::RecoverEarlierRun(const CContentTable* table) {
+    journal_.Open(contentFilePath_);
+    const auto committed = [table](std::uint32_t row, const std::string& download) {
+        return table && row < table->RowCount() &&
+               NormaliseName(table->Field(row, "DownLoadCacheFile")) == NormaliseName(download) &&
+               table->Field(row, "UpgradeStatus") == UpgradeStatus[kAppliedSuccessfully];
+    };
+    return journal_.Recover(committed);
 }

@@ -10,6 +10,7 @@
 #include "entry/progress_data.h"
 #include "manifest/content_table.h"
 #include "model/master_list.h"
+#include "model/run_journal.h"
 #include "platform/bstr.h"
 
 class MENDLER_API CManifestParser {
@@ -86,7 +87,11 @@ private:
     void ApplyGroups(std::int32_t& result, ProgressCallback callback);
     void ApplyGroup(CFileGroup& group, std::int32_t& result, ProgressCallback callback);
     void CleanUp(std::int32_t result, ProgressCallback callback);
-    bool RemoveLeftoversOfCommittedRows(const std::set<std::uint32_t>& cleanedRows);
+    // Finishes or undoes what an interrupted earlier run of the product left, as its journal
+    // names it, checked against the loaded table (none when it did not load). The number of rows
+    // that could not be recovered: each counts as a failure and is not applied by this run.
+    std::uint32_t RecoverEarlierRun(const CContentTable* table);
+    void CleanUpFile(CFile_& file, bool* cleaned);
 
     std::set<std::string> specialFiles_;
     bool specialFileAttempted_ = false;
@@ -106,4 +111,5 @@ private:
 
     CMasterList masterList_;
     std::uint32_t workSteps_ = 0;
+    CRunJournal journal_;
 };

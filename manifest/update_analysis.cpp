@@ -20,7 +20,9 @@ std::int32_t CManifestParser::ProcessUpdateInformation(_bstr_t project, Progress
     std::int32_t result = 0;
     bool present = false;
     const std::string name = std::string(project);
-    if (!LoadManifest(name, &present)) {
+    const bool loaded = LoadManifest(name, &present);
+    if (present) result = static_cast<std::int32_t>(RecoverEarlierRun(loaded ? &table_ : nullptr));
+    if (!loaded) {
         DiscardContentFile();
         TRACE(g_TraceLog, "CManifestParser: ProcessUpdateInformation, Unable to load Content file");
     } else if (!present) {
@@ -71,6 +73,11 @@ void CManifestParser::AnalyzeRow(std::int32_t rowNumber, ProgressCallback callba
         TRACE(g_TraceLog, "CManifestParser:  File '%s' has already been applied, skipping", fileName.c_str());
         return;
     }
+    if (journal_.IsPending(static_cast<std::uint32_t>(rowNumber))) {
+        TRACE(g_TraceLog, "CManifestParser:  File '%s' waits for the recovery of an earlier run, not applied in this run",
+              fileName.c_str());
+        return;
+    }
     TRACE(g_TraceLog, "CManifestParser:  File '%s' is part of group", fileName.c_str());
     const std::string homeDir = GetField("HomeDir");
     const std::uint32_t downloadType = DetermineDownloadtype(GetField("InterestedParties"));
@@ -86,8 +93,9 @@ void CManifestParser::AnalyzeRow(std::int32_t rowNumber, ProgressCallback callba
         return;
     }
     TRACE(g_TraceLog, "CManifestParser:  UpgradeStatus is downloaded or application failed");
-    const CFile_ file(static_cast<std::uint32_t>(rowNumber), true, false, homeDir, fileName, cacheFile, command,
-                      updateDate, needsDecompression, downloadType);
+    CFile_ file(static_cast<std::uint32_t>(rowNumber), true, false, homeDir, fileName, cacheFile, command,
+                updateDate, needsDecompression, downloadType);
+    file.SetJournal(&journal_);
     TestSpecialFile(fileName);
     masterList_.AddFile(group, file, dependancies);
     workSteps_ += needsDecompression ? 2 : 1;

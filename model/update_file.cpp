@@ -4,6 +4,7 @@
 
 #include "commands/platform_utilities.h"
 #include "diag/trace_log.h"
+#include "manifest/name_normalise.h"
 #include "platform/errors.h"
 #include "platform/files.h"
 
@@ -37,7 +38,9 @@ CFile_::CFile_(const CFile_& other)
       HomeDir(other.HomeDir),
       NeedsDecompression(other.NeedsDecompression),
       UpdateDate(other.UpdateDate),
-      TargetReplaced(other.TargetReplaced) {
+      TargetReplaced(other.TargetReplaced),
+      TargetBefore(other.TargetBefore),
+      Journal(other.Journal) {
     TRACE(g_TraceLog, "CFile_: STL constructor complete for item @ %d", Row);
 }
 
@@ -94,7 +97,13 @@ bool CFile_::ClearReadOnly(std::string path) const {
 
 bool CFile_::Remove() {
     TRACE(g_TraceLog, "CFile_: Remove, file name is '%s'", DownLoadCacheFile.c_str());
-    const bool removed = plat::files::Remove(DownLoadCacheFile);
+    bool removed = false;
+    if (NormaliseName(DownLoadCacheFile) == NormaliseName(TargetPath())) {
+        TRACE(g_TraceLog, "CFile_: Remove, the download is the installed file itself, keeping it");
+    } else {
+        ClearReadOnly(DownLoadCacheFile);  // a read-only download would refuse every later run
+        removed = plat::files::Remove(DownLoadCacheFile);
+    }
     TRACE(g_TraceLog, "CFile_: Remove, returning %d", removed);
     return removed;
 }

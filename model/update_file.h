@@ -12,6 +12,9 @@
 #include <vector>
 
 #include "entry/progress_data.h"
+#include "platform/files.h"
+
+class CRunJournal;
 
 class CFile_ {
 public:
@@ -49,6 +52,10 @@ public:
     // Tells the file that a listing of its download's folder found no expansion record.
     void NoExpansionRecord() { ExpansionRecordGone = true; }
 
+    // The product run's journal, in which every step that creates or replaces a file is
+    // recorded before it is taken (run_journal.h). Without one nothing is recorded.
+    void SetJournal(CRunJournal* journal) { Journal = journal; }
+
     // path + ".$bak$", with "x" appended until no file or folder has that name.
     std::string MakeBackupFileName(std::string path) const;
 
@@ -77,24 +84,16 @@ public:
     // the target's previous version (the new file is in place but not applied) is kept: false.
     bool RemoveBackupFile();
 
-    // Deletes the downloaded copy; true when the deletion succeeded.
+    // Deletes the downloaded copy, read-only or not; true when the deletion succeeded. A
+    // download that is the target itself is never deleted (false).
     bool Remove();
-
-    // For a file whose row an earlier run committed (applied) and that run ended before its
-    // clean-up: when the target holds exactly the downloaded bytes, the target's backups, the
-    // expansion record and then the download are deleted, as that clean-up would have done.
-    // Anything else is left alone. False when something it should delete is left.
-    bool RemoveLeftovers();
 
 private:
     std::string TargetDirectory() const;
     std::string TargetPath() const;
     std::int32_t Install();
     bool PreserveTarget(const std::string& target);
-    static std::vector<std::string> ExistingBackups(const std::string& target);
-    bool AdoptEarlierCopy(const std::string& target, const std::vector<std::string>& backups);
-    std::string ReusableBackup(const std::string& target, const std::vector<std::string>& backups,
-                               bool* reused) const;
+    bool BackUp(const std::string& target);
     void InstallThroughSetup(const std::string& target);
     std::int32_t RunCommands();
     bool Undo();
@@ -117,6 +116,9 @@ private:
     // was no target". So no later Apply backs the target up again (that would put this file's
     // own copy into the backup) and no RemoveBackupFile of an unapplied file deletes the backup.
     bool TargetReplaced = false;
+    // The target's attributes and times when it was backed up, given back by a restore.
+    plat::files::FileStatus TargetBefore;
+    CRunJournal* Journal = nullptr;
     // No expansion record of the download is left: ExpansionRecorded removed it or found none,
     // and Decompress has not written one since.
     bool ExpansionRecordGone = false;

@@ -3,6 +3,7 @@
 #include "commands/command_string.h"
 #include "commands/platform_utilities.h"
 #include "diag/trace_log.h"
+#include "model/run_journal.h"
 #include "model/update_file.h"
 #include "platform/errors.h"
 #include "platform/files.h"
@@ -25,6 +26,7 @@ std::int32_t CFile_::Install() {
     CreateDirectoryTree(TargetDirectory());
     const std::string target = TargetPath();
     if (!PreserveTarget(target)) return kNotApplied;
+    if (Journal && !Journal->RecordReplace(Row, DownLoadCacheFile, target, BackupFileName)) return kNotApplied;
     if (!plat::files::Copy(DownLoadCacheFile, target, false)) {
         InstallThroughSetup(target);
         return kNotApplied;
@@ -44,8 +46,8 @@ bool CFile_::PreserveTarget(const std::string& target) {
               "CFile_: Backup not needed, no instance of target file on system to back up...");
         return true;
     }
-    ClearReadOnly(target);  // a read-only target fails the copy, which reports it
     if (TargetReplaced) {
+        ClearReadOnly(target);  // a read-only target fails the copy, which reports it
         // The target holds this file's own copy from an earlier attempt; backing it up now would
         // overwrite the only copy of the previous version with it.
         if (BackupFileName.empty()) {
@@ -57,14 +59,20 @@ bool CFile_::PreserveTarget(const std::string& target) {
         }
         return true;
     }
-    // A retried group backs up into the name made the first time, which may still hold a backup.
-    bool reused = true;
-    if (BackupFileName.empty()) {
-        const std::vector<std::string> backups = ExistingBackups(target);
-        if (AdoptEarlierCopy(target, backups)) return true;
-        BackupFileName = ReusableBackup(target, backups, &reused);
-    }
-    if (reused) ClearReadOnly(BackupFileName);  // a backup of a read-only target is read-only too
+    return BackUp(target);
+}
+
+// A backup always takes a name that was free, so it can only ever be this run's own file: a
+// file found under a backup's name is left alone, whatever it holds. A retried group backs up
+// into the name made the first time (its rollback removed that backup).
+bool CFile_::BackUp(const std::string& target) {
+    const bool retried = !BackupFileName.empty();
+    if (!retried) BackupFileName = MakeBackupFileName(target);
+    plat::files::GetStatus(target, &TargetBefore);  // what a restore gives back
+    ClearReadOnly(target);  // a read-only target fails the copy, which reports it
+    if (retried) ClearReadOnly(BackupFileName);  // a backup of a read-only target is read-only too
+    if (Journal && !Journal->RecordBackup(Row, DownLoadCacheFile, target, BackupFileName, TargetBefore))
+        return false;
     if (!plat::files::CopyToKeep(target, BackupFileName)) {
         TRACE(g_TraceLog, "CFile_: Backup of file %s to %s failed, reason code is %d",
               FileName.c_str(), BackupFileName.c_str(), plat::LastError());
@@ -82,6 +90,7 @@ void CFile_::InstallThroughSetup(const std::string& target) {
           "CFile_: Copy not successfull, reason code is %d, source was (%s), target was (%s), "
           "retrying with SetupAPI",
           plat::LastError(), DownLoadCacheFile.c_str(), target.c_str());
+    if (Journal && !Journal->RecordQueued(Row, DownLoadCacheFile, target)) return;
     bool inUse = false;
     constexpr std::uint32_t kStyle =
         plat::setup::kCopySourceAbsolute | plat::setup::kCopyInUseNeedsReboot;

@@ -6,6 +6,7 @@
 #include "decompress/decompression_objects.h"
 #include "decompress/expansion_record.h"
 #include "diag/trace_log.h"
+#include "model/run_journal.h"
 #include "model/update_file.h"
 
 namespace {
@@ -30,6 +31,10 @@ bool CFile_::Decompress(ProgressCallback callback) {
             TRACE(g_TraceLog, "CFile_::Decompress return value is %d", 0);
             return false;
         }
+    }
+    if (Journal && !Journal->RecordExpansion(Row, DownLoadCacheFile)) {
+        TRACE(g_TraceLog, "CFile_::Decompress return value is %d", 0);
+        return false;
     }
     const bool decompressed = decompressor->Decompress(CompressionType, DownLoadCacheFile, callback);
     if (decompressed) {

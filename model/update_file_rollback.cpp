@@ -10,13 +10,16 @@
 //     later Rollback then tries the restore again, RemoveBackupFile keeps the backup and a
 //     retried Apply does not back the target (this file's copy) up over it.
 #include "diag/trace_log.h"
+#include "model/run_journal.h"
 #include "model/update_file.h"
 #include "platform/errors.h"
 #include "platform/files.h"
 
 bool CFile_::Rollback() {
     TRACE(g_TraceLog, "CFile_: Rollback");
-    const bool result = Undo();
+    // Once the target is its old self and no backup is left, the journal has nothing more
+    // to undo for the row.
+    const bool result = Undo() && (!Journal || Journal->RecordUndone(Row));
     TRACE(g_TraceLog, "CFile_: Rollback returning %d", result);
     return result;
 }
@@ -52,6 +55,7 @@ bool CFile_::RestoreTarget(const std::string& target) {
         return false;
     }
     TargetReplaced = false;  // the target is its old self again; the backup may go
+    CRunJournal::GiveBack(target, TargetBefore);
     TRACE(g_TraceLog, "CFile_: Rollback filecopy success");
     return RemoveBackupFile();
 }

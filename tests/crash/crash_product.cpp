@@ -5,6 +5,7 @@
 #include <algorithm>
 
 #include "decompress/expansion_record.h"
+#include "model/run_journal.h"
 #include "platform/files.h"
 #include "tests/rivzip/memory_streams.h"
 #include "tests/support/test_registry.h"
@@ -166,7 +167,7 @@ void CrashProduct::ExpectFileConsistent(const ProductFile& file, const CContentT
     }
 }
 
-void CrashProduct::ExpectComplete() const {
+void CrashProduct::ExpectComplete(const std::vector<std::string>& downloadsLeft) const {
     EXPECT_FALSE(ContentEntriesPresent());
     EXPECT_FALSE(plat::files::Exists(kContent));
     for (const ProductFile& file : files_) {
@@ -175,7 +176,8 @@ void CrashProduct::ExpectComplete() const {
     }
     EXPECT_EQ(Names("C:\\App\\*"), (std::vector<std::string>{"app.exe", "core.dll", "data.cfg", "packed.exe", "ran.txt",
                                                    "readme.txt"}));
-    EXPECT_EQ(Names("C:\\Pex\\cache\\*"), std::vector<std::string>{}) << "downloads left";
+    EXPECT_EQ(Names("C:\\Pex\\cache\\*"), downloadsLeft) << "downloads left";
+    EXPECT_FALSE(plat::files::Exists(CRunJournal::NameFor(kContent))) << "the run's journal is left";
     EXPECT_EQ(Names("C:\\windows\\temp\\*"), std::vector<std::string>{}) << "temporary files left";
     EXPECT_TRUE(plat::files::Exists(kRunMark));
     std::string value;

@@ -52,8 +52,9 @@ protected:
     void ExpectConsistent() const;
 
     // The state after a complete success: every target new, the content file and its entries
-    // gone, no backup, download or temporary file left, and the install commands' marks made.
-    void ExpectComplete() const;
+    // gone, no backup, download (but those named) or temporary file left, and the install
+    // commands' marks made.
+    void ExpectComplete(const std::vector<std::string>& downloadsLeft = {}) const;
 
     // The bytes at a Windows path, or "(missing)".
     static std::string Contents(const std::string& winPath);

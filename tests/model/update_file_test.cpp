@@ -193,49 +193,49 @@ TEST_F(UpdateFile, FailedRollbacksNeverLoseThePreviousVersionAndAreRetried) {
     EXPECT_FALSE(Exists("C:\\App\\Sub\\b.dll"));
 }
 
-// What a run finds of an earlier run that ended before it was done: the target already holding
-// the new bytes beside the backup of the previous version, or a backup taken just before the end.
-TEST_F(UpdateFile, LeftoversOfAnEndedRunAreTakenOverOnlyWhenTheirBytesProveWhatTheyAre) {
+// A file under a backup's name that this run did not make is never taken for its own, whatever
+// its bytes: a target already at the new version beside an older backup keeps that version on
+// rollback, and the older backup stays as it is.
+TEST_F(UpdateFile, AFileUnderABackupsNameIsNeverAdoptedOrRemoved) {
     machine.WriteFile(kTarget, "new");
-    machine.WriteFile(kBackup, "old");
-    CFile_ copied = Make();
-    EXPECT_EQ(1, copied.Apply());
-    EXPECT_TRUE(trace.Contains("CFile_: 'C:\\App\\Sub\\a.dll' already holds this update, copied by an earlier run "
-                               "that did not finish; its previous version stays in 'C:\\App\\Sub\\a.dll.$bak$'"));
-    EXPECT_FALSE(Exists(kOlderBackup)) << "the new bytes are not backed up over the previous version";
-    EXPECT_TRUE(copied.Rollback());
-    EXPECT_EQ("old", Read(kTarget));
-    EXPECT_FALSE(Exists(kBackup));
-
-    // The target as it is, already in a backup: that backup is taken again, not a second one.
-    machine.WriteFile(kBackup, "old");
-    CFile_ backedUp = Make();
-    EXPECT_EQ(1, backedUp.Apply());
-    EXPECT_EQ("old", Read(kBackup));
-    EXPECT_FALSE(Exists(kOlderBackup));
-    EXPECT_TRUE(backedUp.RemoveBackupFile());
-    EXPECT_FALSE(Exists(kBackup));
-
-    // The new bytes without a backup may have been there before the update: kept on rollback.
-    CFile_ unproven = Make();
-    EXPECT_EQ(1, unproven.Apply());
-    EXPECT_EQ("new", Read(kBackup));
-    EXPECT_TRUE(unproven.Rollback());
+    machine.WriteFile(kBackup, "older");
+    CFile_ file = Make();
+    EXPECT_EQ(1, file.Apply());
+    EXPECT_EQ("new", Read(kOlderBackup));
+    EXPECT_TRUE(file.Rollback());
     EXPECT_EQ("new", Read(kTarget));
+    EXPECT_EQ("older", Read(kBackup));
+    EXPECT_FALSE(Exists(kOlderBackup));
 }
 
-TEST_F(UpdateFile, LeftoversOfACommittedFileGoOnlyWhileTheTargetHoldsTheDownload) {
-    machine.WriteFile(kTarget, "something else");
-    machine.WriteFile(kBackup, "old");
-    machine.WriteFile(kOlderBackup, "older");
-    CFile_ committed(7, true, true, "C:\\App\\Sub", "a.dll", kDownload, "", "", false, 0);
-    EXPECT_TRUE(committed.RemoveLeftovers());
-    EXPECT_TRUE(Exists(kBackup) && Exists(kOlderBackup) && Exists(kDownload)) << "nothing proves they are obsolete";
+// A rollback gives the target back the read-only attribute and the times it had.
+TEST_F(UpdateFile, ARollbackRestoresAttributesAndTimes) {
+    machine.WriteFile(kTarget, "old");
+    constexpr plat::files::FileTime kWritten = 126000000000000000ull;
+    ASSERT_TRUE(plat::files::SetTimes(kTarget, 0, 0, kWritten));
+    ASSERT_TRUE(plat::files::SetAttributes(kTarget, plat::files::kAttrReadOnly));
+    CFile_ file = Make();
+    ASSERT_EQ(1, file.Apply());
+    EXPECT_EQ(0u, plat::files::GetAttributes(kTarget) & plat::files::kAttrReadOnly);
+    EXPECT_TRUE(file.Rollback());
+    EXPECT_EQ("old", Read(kTarget));
+    plat::files::FileStatus status;
+    ASSERT_TRUE(plat::files::GetStatus(kTarget, &status));
+    EXPECT_NE(0u, status.attributes & plat::files::kAttrReadOnly);
+    EXPECT_EQ(kWritten, status.lastWrite);
+}
 
-    machine.WriteFile(kTarget, "new");
-    EXPECT_TRUE(committed.RemoveLeftovers());
-    EXPECT_FALSE(Exists(kBackup) || Exists(kOlderBackup) || Exists(kDownload));
-    EXPECT_EQ("new", Read(kTarget));
+// A read-only download is removed all the same; a download that is the target itself never is.
+TEST_F(UpdateFile, RemovingTheDownload) {
+    ASSERT_TRUE(plat::files::SetAttributes(kDownload, plat::files::kAttrReadOnly));
+    CFile_ file = Make();
+    EXPECT_TRUE(file.Remove());
+    EXPECT_FALSE(Exists(kDownload));
+
+    machine.WriteFile("C:\\App\\a.dll", "installed");
+    CFile_ itself(1, true, true, "C:\\App", "a.dll", "c:\\app\\A.DLL", "", "", false, 0);
+    EXPECT_FALSE(itself.Remove());
+    EXPECT_EQ("installed", Read("C:\\App\\a.dll"));
 }
 
 }  // namespace

@@ -1,0 +1,115 @@
+// The run journal: what a product run is about to create or replace, written down durably
+// before it does so. After an interrupted run (a crash, a power cut, a killed host) the next run
+// finishes or undoes exactly what the journal names, and nothing else: a file the journal does
+// not name is never deleted, adopted or restored, whatever its bytes.
+//
+// The file: "<content file>.$jnl$", text, one record a line ending in LF, fields separated by
+// "|" (no Windows path holds one). Each record is flushed to the disk before the step it
+// announces begins.
+//   B|row|download|target|backup|attributes|created|accessed|written
+//                                  the target is about to be backed up under backup; the
+//                                  attributes and times it has (hexadecimal), to give back
+//   R|row|download|target|backup   the target is about to be replaced by the download; an empty
+//                                  backup: there was no target, the file is new to the machine
+//   Q|row|download|target          the download is about to go to the restart queue
+//   X|row|download                 the download is about to be expanded in place
+//   C|row                          the content file now says the row is applied
+//   U|row                          the row's target is its previous self and its backups are gone
+//   K|row                          the row's clean-up is done: backups, expansion record, download
+// A line that lacks its LF (an append that was cut short) or does not parse is passed over.
+//
+// A row is pending from its first record after its last U or K. Recovery, per pending row, the
+// rows taken newest first (so that rows replacing the same target unwind in reverse):
+//   - committed (a C record, or the content file still names the row's download in that row and
+//     reads it as applied: the run ended between the save and the C record): the backups that
+//     its B records name, its download's expansion record and its download are removed, as the
+//     clean-up would have done;
+//   - otherwise its target gets its previous version back: from the backup of its first R
+//     record (with the attributes and times of its B record), or, when that R names no backup,
+//     by removing the file that the run put there; a backup already gone means the restore was
+//     done. Then every backup its B records name is removed. Without an R record the target was
+//     never touched and only the backups go;
+//   - X and Q records need nothing: the expansion record beside a download says whether it is
+//     expanded, and what the restart queue staged is the queue's.
+// A recovered row is marked U or K. A row whose recovery fails stays pending, is not applied by
+// this run and counts as a failure; the next run tries again. The journal is deleted once no row
+// is pending.
+#pragma once
+#include <cstdint>
+#include <functional>
+#include <map>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "platform/files.h"
+
+namespace plat {
+class CFile;
+}
+
+class CRunJournal {
+public:
+    CRunJournal();
+    ~CRunJournal();
+    CRunJournal(const CRunJournal&) = delete;
+    CRunJournal& operator=(const CRunJournal&) = delete;
+
+    // "<contentFile>.$jnl$".
+    static std::string NameFor(const std::string& contentFile);
+
+    // Points the journal at the file for a content file and reads what an earlier run left in it.
+    // Forgets whatever it held before (a parser runs one product after another).
+    void Open(const std::string& contentFile);
+    const std::string& Path() const { return path_; }
+
+    // Whether the content file says that row is applied, and still names the download in it.
+    using CommittedTest = std::function<bool(std::uint32_t row, const std::string& download)>;
+    // Finishes or undoes what the earlier run left (the rules above). The number of rows that
+    // stay pending.
+    std::uint32_t Recover(const CommittedTest& committed);
+    // True when the row waits for the recovery of an earlier run.
+    bool IsPending(std::uint32_t row) const;
+
+    // The records, each flushed before it returns. False, with a trace line, when it could not
+    // be written: the step it announces must not happen.
+    bool RecordBackup(std::uint32_t row, const std::string& download, const std::string& target,
+                      const std::string& backup, const plat::files::FileStatus& before);
+    bool RecordReplace(std::uint32_t row, const std::string& download, const std::string& target,
+                       const std::string& backup);
+    bool RecordQueued(std::uint32_t row, const std::string& download, const std::string& target);
+    bool RecordExpansion(std::uint32_t row, const std::string& download);
+    bool RecordCommitted(const std::vector<std::uint32_t>& rows);
+    bool RecordUndone(std::uint32_t row);
+    bool RecordCleaned(std::uint32_t row);
+
+    // Gives a restored target the read-only attribute and the times it had before (a copy
+    // brings neither back).
+    static void GiveBack(const std::string& target, const plat::files::FileStatus& before);
+
+    // Ends the run's use of the file: deleted when no row is pending, kept otherwise. False when
+    // it should go and could not.
+    bool Close();
+    // Ends the run's use of the file and deletes it, whatever it still holds (the content file
+    // is about to go, and with it every row the journal could name).
+    bool Discard();
+
+    // One record of a row; fields after the kind, as written.
+    struct Record {
+        char kind = 0;
+        std::vector<std::string> fields;
+    };
+
+private:
+    bool Append(std::uint32_t row, const Record& record);
+    void Fold(std::uint32_t row, const Record& record);
+    bool RecoverRow(std::uint32_t row, const CommittedTest& committed);
+    bool RemoveBackups(std::uint32_t row) const;
+
+    std::string path_;
+    std::unique_ptr<plat::CFile> file_;
+    // Pending rows and their records since their last U or K, in order.
+    std::map<std::uint32_t, std::vector<Record>> pending_;
+    // Pending rows in the order of their first record.
+    std::vector<std::uint32_t> order_;
+};

@@ -1,0 +1,114 @@
+// What a run may touch of what it finds on the machine: only what the product's journal names.
+// Files that merely look like an earlier run's leftovers (a download that is the installed
+// file, a backup beside a target that already holds the new bytes) are never deleted or taken
+// over, and a journal left by an interrupted run is carried out to the letter.
+#include <gtest/gtest.h>
+
+#include "manifest/manifest_parser.h"
+#include "model/run_journal.h"
+#include "platform/cfile.h"
+#include "platform/files.h"
+#include "tests/pipeline/pipeline_fixture.h"
+
+using pextest::ContentRow;
+
+namespace {
+
+class JournalRecovery : public pextest::PipelineTest {
+protected:
+    std::int32_t Run() {
+        CManifestParser parser;
+        return parser.ProcessUpdateInformation(_bstr_t(kProduct), nullptr);
+    }
+    std::string Read(const std::string& path) const { return machine.ReadFile(path); }
+    static bool Exists(const std::string& path) { return plat::files::Exists(path); }
+    void WriteJournal(const std::string& records) const { machine.WriteFile(CRunJournal::NameFor(kContent), records); }
+};
+
+TEST_F(JournalRecovery, FilesThatLookLikeLeftoversAreNeverTouched) {
+    // A row read as applied whose download is the installed file itself.
+    machine.WriteFile("C:\\App\\a.dll", "installed a");
+    ContentRow skipped = Row("a.dll", "unused");
+    skipped["UpgradeStatus"] = "Skipped";
+    skipped["DownLoadCacheFile"] = "C:\\App\\a.dll";
+    // An applied row whose download holds what its target holds, beside a backup that some other
+    // row keeps.
+    machine.WriteFile("C:\\App\\b.dll", "new b");
+    machine.WriteFile("C:\\App\\b.dll.$bak$", "old b, kept");
+    ContentRow applied = Row("b.dll", "new b");
+    applied["UpgradeStatus"] = "AppliedSuccessfully";
+    Publish({skipped, applied, Row("c.dll", "new c")});
+    EXPECT_EQ(Run(), 0);
+    EXPECT_EQ(Read("C:\\App\\a.dll"), "installed a");
+    EXPECT_EQ(Read("C:\\App\\b.dll.$bak$"), "old b, kept");
+    EXPECT_EQ(Read("C:\\App\\c.dll"), "new c");
+}
+
+// A target already at the new version, beside an older backup that this run did not make: the
+// rollback of its group gives back what the target held, not the older file.
+TEST_F(JournalRecovery, ARollbackNeverInstallsABackupItDidNotTake) {
+    machine.WriteFile("C:\\App\\a.dll", "new a");
+    machine.WriteFile("C:\\App\\a.dll.$bak$", "older a");
+    ContentRow failing = Row("b.dll", "new b", "G");
+    failing["Command"] = "[RUN]nosuchprogram.exe";
+    Publish({Row("a.dll", "new a", "G"), failing});
+    EXPECT_EQ(Run(), 1);
+    EXPECT_EQ(Read("C:\\App\\a.dll"), "new a");
+    EXPECT_EQ(Read("C:\\App\\a.dll.$bak$"), "older a");
+    EXPECT_FALSE(Exists("C:\\App\\a.dll.$bak$x"));
+    EXPECT_FALSE(Exists(CRunJournal::NameFor(kContent))) << "nothing is left to recover";
+}
+
+// An interrupted run's journal: a row it had replaced and not committed gets its previous
+// version back (with its read-only attribute) before it is applied again; a row it had
+// committed loses its backup and download; a torn last record and files it does not name are
+// left alone.
+TEST_F(JournalRecovery, AnInterruptedRunIsFinishedOrUndoneAsItsJournalSays) {
+    machine.WriteFile("C:\\App\\a.dll", "new a");
+    machine.WriteFile("C:\\App\\a.dll.$bak$", "old a");
+    machine.WriteFile("C:\\App\\b.dll", "new b");
+    machine.WriteFile("C:\\App\\b.dll.$bak$", "old b");
+    machine.WriteFile("C:\\App\\c.dll.$bak$", "not named");
+    ContentRow a = Row("a.dll", "new a", "G");
+    a["Command"] = "[RUN]nosuchprogram.exe";  // so that the run ends with a's previous version in place
+    ContentRow b = Row("b.dll", "new b");
+    b["UpgradeStatus"] = "AppliedSuccessfully";
+    Publish({a, b});
+    WriteJournal("B|0|C:\\Pex\\cache\\a.dll.new|C:\\App\\a.dll|C:\\App\\a.dll.$bak$|1|0|0|0\n"
+                 "R|0|C:\\Pex\\cache\\a.dll.new|C:\\App\\a.dll|C:\\App\\a.dll.$bak$\n"
+                 "B|1|C:\\Pex\\cache\\b.dll.new|C:\\App\\b.dll|C:\\App\\b.dll.$bak$|0|0|0|0\n"
+                 "R|1|C:\\Pex\\cache\\b.dll.new|C:\\App\\b.dll|C:\\App\\b.dll.$bak$\n"
+                 "B|2|C:\\Pex\\cache\\c.dll.new|C:\\App\\c.dll|C:\\App\\c.dll.$bak$|0|0|0|0");
+    EXPECT_EQ(Run(), 1);
+    EXPECT_EQ(Read("C:\\App\\a.dll"), "old a");
+    EXPECT_NE(plat::files::GetAttributes("C:\\App\\a.dll") & plat::files::kAttrReadOnly, 0u);
+    EXPECT_FALSE(Exists("C:\\App\\a.dll.$bak$"));
+    EXPECT_EQ(Read("C:\\App\\b.dll"), "new b");
+    EXPECT_FALSE(Exists("C:\\App\\b.dll.$bak$") || Exists("C:\\Pex\\cache\\b.dll.new"));
+    EXPECT_EQ(Read("C:\\App\\c.dll.$bak$"), "not named");
+    EXPECT_FALSE(Exists(CRunJournal::NameFor(kContent)));
+}
+
+// A row whose recovery fails (its target is held) waits: it is not applied over the backup that
+// holds its previous version, it counts as a failure, and the next run finishes the recovery.
+TEST_F(JournalRecovery, ARowWhoseRecoveryFailsWaitsForTheNextRun) {
+    machine.WriteFile("C:\\App\\a.dll", "new a");
+    machine.WriteFile("C:\\App\\a.dll.$bak$", "old a");
+    Publish({Row("a.dll", "new a"), Row("b.dll", "new b")});
+    WriteJournal("R|0|C:\\Pex\\cache\\a.dll.new|C:\\App\\a.dll|C:\\App\\a.dll.$bak$\n");
+    {
+        plat::CFile holder;
+        ASSERT_TRUE(holder.Open("C:\\App\\a.dll", plat::CFile::modeRead | plat::CFile::shareDenyWrite));
+        EXPECT_EQ(Run(), 1);
+    }
+    EXPECT_EQ(Read("C:\\App\\a.dll.$bak$"), "old a");
+    EXPECT_EQ(Read("C:\\App\\b.dll"), "new b");
+    EXPECT_EQ(Cell(0, "UpgradeStatus"), "Downloaded");
+    EXPECT_TRUE(Exists(CRunJournal::NameFor(kContent)));
+    EXPECT_EQ(Run(), 0);
+    EXPECT_EQ(Read("C:\\App\\a.dll"), "new a");
+    EXPECT_FALSE(Exists("C:\\App\\a.dll.$bak$"));
+    EXPECT_FALSE(Exists(CRunJournal::NameFor(kContent)));
+}
+
+}  // namespace
