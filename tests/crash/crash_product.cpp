@@ -70,6 +70,13 @@ void CrashProduct::SetUp() {
     rows[2]["Command"] = "[TRY-RUN]pextestprog mark ran.txt";
     rows[2]["UpdateDate"] = "2003-12-31 22:30:00";
     ASSERT_TRUE(plat::files::SetAttributes(files_[1].Target(), plat::files::kAttrReadOnly));
+    machine.WriteFile(kInstalled, "keep 1.0");
+    machine.WriteFile(kForeignBackup, "app 0.9, another tool's");
+    ContentRow skipped = Row("keep.dll", "unused");
+    skipped["UpgradeStatus"] = "Skipped";
+    skipped["DownLoadCacheFile"] = kInstalled;
+    ASSERT_TRUE(plat::files::Remove("C:\\Pex\\cache\\keep.dll.new"));  // the row names the installed file instead
+    rows.push_back(skipped);
     Publish(rows);
 }
 
@@ -83,7 +90,7 @@ std::vector<std::string> CrashProduct::Backups(const std::string& target) {
     // A gap in the chain is possible (an earlier backup removed), so look a little further.
     std::string name = target + ".$bak$";
     for (int i = 0; i < 8; ++i, name += "x") {
-        if (plat::files::Exists(name)) found.push_back(Contents(name));
+        if (name != kForeignBackup && plat::files::Exists(name)) found.push_back(Contents(name));
     }
     return found;
 }
@@ -106,6 +113,7 @@ bool CrashProduct::ContentNamed() const {
 
 void CrashProduct::ExpectConsistent() const {
     // A complete success deletes the content file, then its entries, the name last.
+    ExpectLookAlikesUntouched();
     const bool named = ContentNamed(), present = plat::files::Exists(kContent);
     if (!named || !present) {
         EXPECT_FALSE(present) << "a content file that no entry names";
@@ -114,7 +122,7 @@ void CrashProduct::ExpectConsistent() const {
     }
     CContentTable table;
     ASSERT_EQ(table.LoadFromFile(kContent, true, ','), CContentTable::kOk) << "the content file does not load";
-    ASSERT_EQ(table.RowCount(), files_.size());
+    ASSERT_EQ(table.RowCount(), files_.size() + 1);
     for (std::size_t i = 0; i < files_.size(); ++i) {
         ASSERT_EQ(table.Field(static_cast<std::uint32_t>(i), "FileName"), files_[i].name);
         ExpectFileConsistent(files_[i], &table, static_cast<int>(i));
@@ -167,15 +175,21 @@ void CrashProduct::ExpectFileConsistent(const ProductFile& file, const CContentT
     }
 }
 
+void CrashProduct::ExpectLookAlikesUntouched() const {
+    EXPECT_EQ(Contents(kInstalled), "keep 1.0");
+    EXPECT_EQ(Contents(kForeignBackup), "app 0.9, another tool's");
+}
+
 void CrashProduct::ExpectComplete(const std::vector<std::string>& downloadsLeft) const {
+    ExpectLookAlikesUntouched();
     EXPECT_FALSE(ContentEntriesPresent());
     EXPECT_FALSE(plat::files::Exists(kContent));
     for (const ProductFile& file : files_) {
         EXPECT_EQ(Which(file, Contents(file.Target())), "new") << file.name;
         EXPECT_TRUE(Backups(file.Target()).empty()) << file.name << " has a backup left";
     }
-    EXPECT_EQ(Names("C:\\App\\*"), (std::vector<std::string>{"app.exe", "core.dll", "data.cfg", "packed.exe", "ran.txt",
-                                                   "readme.txt"}));
+    EXPECT_EQ(Names("C:\\App\\*"), (std::vector<std::string>{"app.exe", "app.exe.$bak$", "core.dll", "data.cfg", "keep.dll",
+                                                   "packed.exe", "ran.txt", "readme.txt"}));
     EXPECT_EQ(Names("C:\\Pex\\cache\\*"), downloadsLeft) << "downloads left";
     EXPECT_FALSE(plat::files::Exists(CRunJournal::NameFor(kContent))) << "the run's journal is left";
     EXPECT_EQ(Names("C:\\windows\\temp\\*"), std::vector<std::string>{}) << "temporary files left";

@@ -7,6 +7,9 @@
 //                     sorts before it, so the first pass defers it
 //         readme.txt  a new file: nothing to back up, a rollback deletes it
 //   Data  data.cfg    zlib download, replaces a file
+// Beside them, files that only look like leftovers of an earlier run, which no run may touch: a
+// row read as applied ("Skipped") whose download is an installed file, keep.dll, and a backup
+// of app.exe that some other tool left.
 #pragma once
 #include <string>
 #include <vector>
@@ -30,6 +33,8 @@ class CrashProduct : public PipelineTest {
 protected:
     static constexpr const char* kRegistryMark = "Software\\Vantric\\Zendor32\\Installed";
     static constexpr const char* kRunMark = "C:\\App\\ran.txt";
+    static constexpr const char* kInstalled = "C:\\App\\keep.dll";
+    static constexpr const char* kForeignBackup = "C:\\App\\app.exe.$bak$";
 
     void SetUp() override;
 
@@ -69,6 +74,7 @@ protected:
 
 private:
     void ExpectFileConsistent(const ProductFile& file, const CContentTable* table, int row) const;
+    void ExpectLookAlikesUntouched() const;
     bool ContentNamed() const;
 };
 
