@@ -176,6 +176,23 @@ TEST_F(ApplyPipeline, AReadOnlyTargetIsReplaced) {
     EXPECT_FALSE(plat::files::Exists("C:\\App\\locked.ini.$bak$"));
 }
 
+// A read-only download is removed like any other; one that another program holds is left with a
+// trace line, and neither keeps the content file of a complete success or the progress short.
+TEST_F(ApplyPipeline, DownloadsThatResistRemovalDoNotKeepTheContentFile) {
+    Publish({Row("ro.dll", "read-only download"), Row("held.dll", "held download")});
+    ASSERT_TRUE(plat::files::SetAttributes("C:\\Pex\\cache\\ro.dll.new", plat::files::kAttrReadOnly));
+    plat::CFile holder;
+    ASSERT_TRUE(holder.Open("C:\\Pex\\cache\\held.dll.new", plat::CFile::modeRead | plat::CFile::shareDenyWrite));
+    const std::int32_t before = g_ProgressData.CurrentStep;
+    EXPECT_EQ(Run(&CountSteps), 0);
+    EXPECT_EQ(g_steps - before, g_total);
+    EXPECT_FALSE(plat::files::Exists("C:\\Pex\\cache\\ro.dll.new"));
+    EXPECT_TRUE(trace.Contains("CManifestParser: ProcessUpdateInformation, unable to remove download "
+                               "'C:\\Pex\\cache\\held.dll.new', left in place"));
+    EXPECT_FALSE(plat::files::Exists(kContent));
+    EXPECT_FALSE(ContentEntriesPresent());
+}
+
 TEST_F(ApplyPipeline, ASpecialFileResetsTheHostsSchedule) {
     const std::string key = "Software\\Vantric\\Zendor32\\MatrixUpdates";
     pextest::SetRegText(reg::kLocalMachine, key, "NextDate", "12/31/2026");
