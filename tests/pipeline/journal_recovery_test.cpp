@@ -61,14 +61,17 @@ TEST_F(JournalRecovery, ARollbackNeverInstallsABackupItDidNotTake) {
 
 // An interrupted run's journal: a row it had replaced and not committed gets its previous
 // version back (with its read-only attribute) before it is applied again; a row it had
-// committed loses its backup and download; a torn last record and files it does not name are
-// left alone.
+// committed loses its backup and download, but never a download that is its installed file; a
+// settled row, a torn last record and files it does not name are left alone.
 TEST_F(JournalRecovery, AnInterruptedRunIsFinishedOrUndoneAsItsJournalSays) {
     machine.WriteFile("C:\\App\\a.dll", "new a");
+    ASSERT_TRUE(plat::files::SetAttributes("C:\\App\\a.dll", plat::files::kAttrReadOnly));
     machine.WriteFile("C:\\App\\a.dll.$bak$", "old a");
     machine.WriteFile("C:\\App\\b.dll", "new b");
     machine.WriteFile("C:\\App\\b.dll.$bak$", "old b");
-    machine.WriteFile("C:\\App\\c.dll.$bak$", "not named");
+    machine.WriteFile("C:\\App\\c.dll.$bak$", "settled");
+    machine.WriteFile("C:\\App\\d.dll", "d, its own download");
+    machine.WriteFile("C:\\App\\e.dll.$bak$", "not named");
     ContentRow a = Row("a.dll", "new a", "G");
     a["Command"] = "[RUN]nosuchprogram.exe";  // so that the run ends with a's previous version in place
     ContentRow b = Row("b.dll", "new b");
@@ -78,14 +81,20 @@ TEST_F(JournalRecovery, AnInterruptedRunIsFinishedOrUndoneAsItsJournalSays) {
                  "R|0|C:\\Pex\\cache\\a.dll.new|C:\\App\\a.dll|C:\\App\\a.dll.$bak$\n"
                  "B|1|C:\\Pex\\cache\\b.dll.new|C:\\App\\b.dll|C:\\App\\b.dll.$bak$|0|0|0|0\n"
                  "R|1|C:\\Pex\\cache\\b.dll.new|C:\\App\\b.dll|C:\\App\\b.dll.$bak$\n"
-                 "B|2|C:\\Pex\\cache\\c.dll.new|C:\\App\\c.dll|C:\\App\\c.dll.$bak$|0|0|0|0");
+                 "B|2|C:\\Pex\\cache\\c.dll.new|C:\\App\\c.dll|C:\\App\\c.dll.$bak$|0|0|0|0\n"
+                 "U|2\n"
+                 "R|3|C:\\App\\d.dll|C:\\App\\d.dll|\n"
+                 "C|3\n"
+                 "B|4|C:\\Pex\\cache\\e.dll.new|C:\\App\\e.dll|C:\\App\\e.dll.$bak$|0|0|0|0");
     EXPECT_EQ(Run(), 1);
     EXPECT_EQ(Read("C:\\App\\a.dll"), "old a");
     EXPECT_NE(plat::files::GetAttributes("C:\\App\\a.dll") & plat::files::kAttrReadOnly, 0u);
     EXPECT_FALSE(Exists("C:\\App\\a.dll.$bak$"));
     EXPECT_EQ(Read("C:\\App\\b.dll"), "new b");
     EXPECT_FALSE(Exists("C:\\App\\b.dll.$bak$") || Exists("C:\\Pex\\cache\\b.dll.new"));
-    EXPECT_EQ(Read("C:\\App\\c.dll.$bak$"), "not named");
+    EXPECT_EQ(Read("C:\\App\\c.dll.$bak$"), "settled");
+    EXPECT_EQ(Read("C:\\App\\d.dll"), "d, its own download");
+    EXPECT_EQ(Read("C:\\App\\e.dll.$bak$"), "not named");
     EXPECT_FALSE(Exists(CRunJournal::NameFor(kContent)));
 }
 
