@@ -86,8 +86,9 @@ void CManifestParser::AnalyzeRow(std::int32_t rowNumber, ProgressCallback callba
         return;
     }
     TRACE(g_TraceLog, "CManifestParser:  UpgradeStatus is downloaded or application failed");
-    const CFile_ file(static_cast<std::uint32_t>(rowNumber), true, false, homeDir, fileName, cacheFile, command,
-                      updateDate, needsDecompression, downloadType);
+    CFile_ file(static_cast<std::uint32_t>(rowNumber), true, false, homeDir, fileName, cacheFile, command,
+                updateDate, needsDecompression, downloadType);
+    file.SetExpectedSha256(GetField("Sha256"));
     TestSpecialFile(fileName);
     masterList_.AddFile(group, file, dependancies);
     workSteps_ += needsDecompression ? 2 : 1;

@@ -37,7 +37,8 @@ CFile_::CFile_(const CFile_& other)
       HomeDir(other.HomeDir),
       NeedsDecompression(other.NeedsDecompression),
       UpdateDate(other.UpdateDate),
-      TargetReplaced(other.TargetReplaced) {
+      TargetReplaced(other.TargetReplaced),
+      ExpectedSha256(other.ExpectedSha256) {
     TRACE(g_TraceLog, "CFile_: STL constructor complete for item @ %d", Row);
 }
 
