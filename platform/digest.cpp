@@ -50,8 +50,7 @@ bool Sha256File(const std::string& path, std::string* hexLowercase) {
     std::string hex;
     if (!Stream(file, sha) || !sha.Finish(&hex)) return false;
     *hexLowercase = hex;
-    SetLastErrorCode(kErrorSuccess);
-    return true;
+    return true;  // the open left the last error at success
 }
 
 }  // namespace plat::digest

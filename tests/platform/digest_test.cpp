@@ -28,6 +28,17 @@ TEST_F(Digest, FilesGiveTheStandardVectorsInLowerCase) {
     EXPECT_EQ(plat::LastError(), plat::kErrorSuccess);
 }
 
+// Fed in pieces, the digest is that of the bytes joined, whatever the text it is given into.
+TEST_F(Digest, PiecesAreDigestedAsOneText) {
+    plat::digest::Sha256 sha;
+    ASSERT_TRUE(sha.Update("a", 1));
+    ASSERT_TRUE(sha.Update("", 0));
+    ASSERT_TRUE(sha.Update("bc", 2));
+    std::string hex = "stale";
+    ASSERT_TRUE(sha.Finish(&hex));
+    EXPECT_EQ(hex, "ba7816bf8f01cfea414140de5dae2223b00361a396177a9cb410ff61f20015ad");
+}
+
 // Several read blocks, the last one short: every byte counts once, in order.
 TEST_F(Digest, AFileOfSeveralBlocksIsDigestedWhole) {
     std::string bytes(3 * (1u << 20) + 7, '\0');
