@@ -12,8 +12,6 @@ namespace plat::digest {
 
 namespace {
 
-bool Succeeded(NTSTATUS status) { return status >= 0; }
-
 bool LibraryFailed() {
     SetLastErrorCode(kErrorGenFailure);
     return false;
@@ -32,18 +30,18 @@ struct Sha256::State {
         if (algorithm) ::BCryptCloseAlgorithmProvider(algorithm, 0);
     }
     bool Start() {
-        if (!Succeeded(::BCryptOpenAlgorithmProvider(&algorithm, BCRYPT_SHA256_ALGORITHM, nullptr, 0))) {
+        if (!BCRYPT_SUCCESS(::BCryptOpenAlgorithmProvider(&algorithm, BCRYPT_SHA256_ALGORITHM, nullptr, 0))) {
             algorithm = nullptr;
             return false;
         }
         DWORD objectLength = 0;
         ULONG got = 0;
-        if (!Succeeded(::BCryptGetProperty(algorithm, BCRYPT_OBJECT_LENGTH,
+        if (!BCRYPT_SUCCESS(::BCryptGetProperty(algorithm, BCRYPT_OBJECT_LENGTH,
                                            reinterpret_cast<PUCHAR>(&objectLength), sizeof objectLength,
                                            &got, 0)))
             return false;
         hashObject.resize(objectLength);
-        if (!Succeeded(::BCryptCreateHash(algorithm, &hash, hashObject.data(), objectLength, nullptr, 0, 0))) {
+        if (!BCRYPT_SUCCESS(::BCryptCreateHash(algorithm, &hash, hashObject.data(), objectLength, nullptr, 0, 0))) {
             hash = nullptr;
             return false;
         }
@@ -60,7 +58,7 @@ bool Sha256::Update(const void* bytes, std::size_t count) {
     auto* next = static_cast<PUCHAR>(const_cast<void*>(bytes));  // BCrypt does not write it
     while (count > 0) {
         const ULONG piece = count > 0x40000000u ? 0x40000000u : static_cast<ULONG>(count);
-        if (!Succeeded(::BCryptHashData(state_->hash, next, piece, 0))) return LibraryFailed();
+        if (!BCRYPT_SUCCESS(::BCryptHashData(state_->hash, next, piece, 0))) return LibraryFailed();
         next += piece;
         count -= piece;
     }
@@ -68,7 +66,7 @@ bool Sha256::Update(const void* bytes, std::size_t count) {
 }
 
 bool Sha256::FinishBytes(unsigned char (&bytes)[kBytes]) {
-    if (!state_->hash || !Succeeded(::BCryptFinishHash(state_->hash, bytes, kBytes, 0))) return LibraryFailed();
+    if (!state_->hash || !BCRYPT_SUCCESS(::BCryptFinishHash(state_->hash, bytes, kBytes, 0))) return LibraryFailed();
     return true;
 }
 
