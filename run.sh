@@ -12,7 +12,7 @@ set -euo pipefail
 cd "$(dirname "$0")"
 
 PACKAGES=(cmake make g++ pkg-config libgtest-dev libgmock-dev libsqlite3-dev zlib1g-dev flex bison
-          mscompress libmspack-dev)
+          mscompress libmspack-dev libssl-dev)
 BUILD=build
 
 install_missing() {

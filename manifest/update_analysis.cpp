@@ -96,6 +96,7 @@ void CManifestParser::AnalyzeRow(std::int32_t rowNumber, ProgressCallback callba
     CFile_ file(static_cast<std::uint32_t>(rowNumber), true, false, homeDir, fileName, cacheFile, command,
                 updateDate, needsDecompression, downloadType);
     file.SetJournal(&journal_);
+    file.SetExpectedSha256(GetField("Sha256"));
     TestSpecialFile(fileName);
     masterList_.AddFile(group, file, dependancies);
     workSteps_ += needsDecompression ? 2 : 1;

@@ -40,7 +40,8 @@ CFile_::CFile_(const CFile_& other)
       UpdateDate(other.UpdateDate),
       TargetReplaced(other.TargetReplaced),
       TargetBefore(other.TargetBefore),
-      Journal(other.Journal) {
+      Journal(other.Journal),
+      ExpectedSha256(other.ExpectedSha256) {
     TRACE(g_TraceLog, "CFile_: STL constructor complete for item @ %d", Row);
 }
 

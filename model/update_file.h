@@ -38,6 +38,9 @@ public:
     bool IsApplied() const;
     bool IsDecompressionNeeded() const { return NeedsDecompression; }
     bool IsMandatory() const { return true; }  // no row makes a file optional
+    // The SHA-256 digest (hexadecimal, either case) that the download must have, after any
+    // expansion, for Apply to install it; empty: no check.
+    void SetExpectedSha256(const std::string& digest) { ExpectedSha256 = digest; }
 
     // Expands the downloaded copy in place through the process-wide decompressor, created on
     // first use. True when the copy is ready; then no further decompression is needed.
@@ -98,6 +101,7 @@ private:
     std::int32_t RunCommands();
     bool Undo();
     bool RestoreTarget(const std::string& target);
+    bool DownloadMatchesDigest() const;
 
     std::uint32_t Row;
     std::string FileName;
@@ -122,4 +126,5 @@ private:
     // No expansion record of the download is left: ExpansionRecorded removed it or found none,
     // and Decompress has not written one since.
     bool ExpansionRecordGone = false;
+    std::string ExpectedSha256;  // as the row gives it, untrimmed
 };

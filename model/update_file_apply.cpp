@@ -22,6 +22,7 @@ std::int32_t CFile_::Install() {
         return kApplied;
     }
     TRACE(g_TraceLog, "CFile_: Applying file '%s'", FileName.c_str());
+    if (!DownloadMatchesDigest()) return kNotApplied;  // before anything is touched
     // A folder that cannot be made shows as the copy's failure below.
     CreateDirectoryTree(TargetDirectory());
     const std::string target = TargetPath();

@@ -1,5 +1,6 @@
 # The application framework's pieces: file class, synchronisation and time, date parser, COM
-# string, application object. Portable code sits in platform/, the rest in the backend folder.
+# string, application object; and the digests of files, which read through the file class.
+# Portable code sits in platform/, the rest in the backend folder.
 if(WIN32)
   set(PEX_FRAMEWORK_BACKEND win32)
 else()
@@ -12,12 +13,18 @@ add_library(pex_framework STATIC
   ${CMAKE_CURRENT_SOURCE_DIR}/bstr.cpp
   ${CMAKE_CURRENT_SOURCE_DIR}/app.cpp
   ${CMAKE_CURRENT_SOURCE_DIR}/${PEX_FRAMEWORK_BACKEND}/cfile.cpp
-  ${CMAKE_CURRENT_SOURCE_DIR}/${PEX_FRAMEWORK_BACKEND}/sync.cpp)
+  ${CMAKE_CURRENT_SOURCE_DIR}/${PEX_FRAMEWORK_BACKEND}/sync.cpp
+  ${CMAKE_CURRENT_SOURCE_DIR}/digest.cpp
+  ${CMAKE_CURRENT_SOURCE_DIR}/${PEX_FRAMEWORK_BACKEND}/sha256.cpp)
 # Paths, errors and the fault plan come from the base; the application profile from the registry.
 target_link_libraries(pex_framework PUBLIC pex_platform_base pex_registry)
-if(NOT WIN32)
+# SHA-256 comes from the platform's maintained cryptography: BCrypt on Windows, libcrypto here.
+if(WIN32)
+  target_link_libraries(pex_framework PUBLIC bcrypt)
+else()
   find_package(Threads REQUIRED)
-  target_link_libraries(pex_framework PUBLIC Threads::Threads)
+  find_package(OpenSSL REQUIRED COMPONENTS Crypto)
+  target_link_libraries(pex_framework PUBLIC Threads::Threads OpenSSL::Crypto)
 endif()
 pex_warnings(pex_framework)
 list(APPEND PEX_PLATFORM_PARTS pex_framework)

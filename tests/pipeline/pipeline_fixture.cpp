@@ -21,6 +21,17 @@ std::string Join(const std::vector<std::string>& cells) {
     return line + "\r\n";
 }
 
+// The usual columns, then the others that some row has, in name order.
+std::vector<std::string> ColumnsOf(const std::vector<ContentRow>& rows) {
+    std::vector<std::string> columns = kColumns;
+    for (const ContentRow& row : rows)
+        for (const auto& cell : row)
+            if (std::find(columns.begin(), columns.end(), cell.first) == columns.end())
+                columns.push_back(cell.first);
+    std::sort(columns.begin() + static_cast<std::ptrdiff_t>(kColumns.size()), columns.end());
+    return columns;
+}
+
 }  // namespace
 
 void PipelineTest::Publish(const std::vector<ContentRow>& rows, const std::string& mode) {
@@ -28,10 +39,11 @@ void PipelineTest::Publish(const std::vector<ContentRow>& rows, const std::strin
     SetRegText(reg::kLocalMachine, section, "ContentFileName", kContent);
     SetRegText(reg::kLocalMachine, section, "ContentFileMode", mode);
     SetRegText(reg::kLocalMachine, section, "ContentFileTarget", "");
-    std::string text = Join(kColumns);
+    const std::vector<std::string> columns = ColumnsOf(rows);
+    std::string text = Join(columns);
     for (const ContentRow& row : rows) {
         std::vector<std::string> cells;
-        for (const std::string& column : kColumns) {
+        for (const std::string& column : columns) {
             auto it = row.find(column);
             cells.push_back(it == row.end() ? "" : it->second);
         }

@@ -22,7 +22,8 @@ protected:
     static constexpr const char* kContent = "C:\\Pex\\Zendor32_content.txt";
     static constexpr const char* kHome = "C:\\App";
 
-    // Registers the product with its content file and mode; writes the content file.
+    // Registers the product with its content file and mode; writes the content file, with a
+    // column for every cell name that some row has.
     void Publish(const std::vector<ContentRow>& rows, const std::string& mode = "");
     // A row installing fileName from a download of bytes (C:\Pex\cache\<fileName>.new), in
     // status Downloaded.
