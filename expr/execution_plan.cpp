@@ -29,14 +29,17 @@ ExecutionPlan::~ExecutionPlan() {
 bool ExecutionPlan::Parse(const std::string& text) {
     TRACE(g_TraceLog, "Parsing: %s\n", text.c_str());
     g_currentPlan = this;
-    return ParseOverrideText(text) == 0;
+    const int result = ParseOverrideText(text);
+    // The bounds on a script are this system's own: the support log says which was exceeded.
+    const std::string refusal = ParseRefusalMessage(result);
+    if (!refusal.empty()) TRACE(g_TraceLog, "ExecutionPlan: Parse, %s\n", refusal.c_str());
+    return result == kParseAccepted;
 }
 
-void ExecutionPlan::Push(const COverrideExpression& node) {
-    COverrideExpression item = node;
+void ExecutionPlan::Push(COverrideExpression node) {
     TRACE(g_TraceLog, "pushing # %d, %s\n", static_cast<int>(items_.size() + 1),
-          item.DisplayText().c_str());
-    items_.push_back(item);
+          node.DisplayText().c_str());
+    items_.push_back(std::move(node));
 }
 
 bool ExecutionPlan::Validate() {
