@@ -1,5 +1,7 @@
 #include "expr/execution_plan.h"
 
+#include <exception>
+
 #include "commands/update_services.h"
 #include "diag/trace_log.h"
 #include "expr/evaluation.h"
@@ -69,6 +71,13 @@ std::int32_t ExecutionPlan::Execute(UpdateServices& services) {
             TRACE(g_TraceLog, "Plan Execution threw exception");
             code = failure.code;
             comments_.push_back(failure.DisplayText());
+        } catch (const std::exception& failure) {
+            // Not the language's own failure (memory ran out, a file operation failed): the
+            // item fails like one, and the row's other items and the other rows go on.
+            TRACE(g_TraceLog, "ExecutionPlan: Execute, item # %d failed: %s\n", static_cast<int>(i),
+                  failure.what());
+            code = COverrideExpression::kUnexpected;
+            comments_.push_back(COverrideExpression::Failure(code, failure.what()).DisplayText());
         }
         TRACE(g_TraceLog, "-- Done.\n");
     }
