@@ -10,6 +10,7 @@
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "platform/pe_resources.h"
+#include "platform/regular_file.h"
 #include "tests/support/environment.h"
 #include "tests/support/test_machine.h"
 
@@ -87,6 +88,35 @@ TEST(VersionInfo, FilesWithoutVersionInformation) {
     EXPECT_FALSE(plat::ver::Read("C:\\notes.txt", &info));
     EXPECT_EQ(plat::LastError(), plat::ver::kErrorResourceDataNotFound);
     EXPECT_FALSE(plat::ver::Read("C:\\missing.dll", &info));
+    EXPECT_EQ(plat::LastError(), 2u);
+#ifndef _WIN32
+    // Devices have no version information, and are not read.
+    EXPECT_FALSE(plat::ver::Read("Z:\\dev\\zero", &info));
+    EXPECT_EQ(plat::LastError(), plat::ver::kErrorResourceDataNotFound);
+#endif
+}
+
+// Version information is read piece by piece, and only from regular files.
+TEST(RegularFile, OpensOnlyRegularFilesAndReadsWholePiecesInside) {
+    pextest::TestMachine m;
+    m.WriteFile("C:\\pextest_pieces\\a.bin", "0123456789");
+    plat::files::RegularFile file;
+    ASSERT_TRUE(file.Open("C:\\pextest_pieces\\a.bin"));
+    EXPECT_EQ(file.Size(), 10u);
+    std::string bytes;
+    EXPECT_TRUE(file.ReadAt(3, 4, &bytes));
+    EXPECT_EQ(bytes, "3456");
+    EXPECT_TRUE(file.ReadAt(6, 4, &bytes));
+    EXPECT_EQ(bytes, "6789");
+    EXPECT_FALSE(file.ReadAt(8, 3, &bytes));
+    EXPECT_FALSE(file.ReadAt(~std::uint64_t{0}, 2, &bytes));
+    EXPECT_FALSE(file.Open("C:\\pextest_pieces\\a.bin"));  // already open
+
+    plat::files::RegularFile folder, missing;
+    EXPECT_FALSE(folder.Open("C:\\pextest_pieces"));
+    EXPECT_EQ(plat::LastError(), plat::kErrorAccessDenied);
+    EXPECT_FALSE(folder.ReadAt(0, 0, &bytes));
+    EXPECT_FALSE(missing.Open("C:\\pextest_pieces\\none.bin"));
     EXPECT_EQ(plat::LastError(), 2u);
 }
 
