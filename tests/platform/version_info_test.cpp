@@ -96,6 +96,32 @@ TEST(VersionInfo, FilesWithoutVersionInformation) {
 #endif
 }
 
+std::uint32_t U32At(const std::string& b, std::size_t at) {
+    std::uint32_t v = 0;
+    for (int i = 3; i >= 0; --i) v = (v << 8) | static_cast<unsigned char>(b[at + static_cast<std::size_t>(i)]);
+    return v;
+}
+
+// The resource lookup trusts nothing the headers say beyond what they hold.
+TEST(VersionInfo, ResourceLookupFollowsOnlyHeadersThatHoldTogether) {
+    pextest::TestMachine m;
+    std::string file;
+    ASSERT_TRUE(plat::files::ReadAll(Fixture(), &file));
+    std::string data;
+    EXPECT_EQ(plat::pe::FirstResourceOfType(file, 3, &data), plat::pe::Lookup::NotFound);  // no icons
+    const std::size_t pe = U32At(file, 60), opt = pe + 24;
+    const std::size_t optSize = U32At(file, pe + 20) & 0xFFFF;
+    // A section table cut short.
+    EXPECT_EQ(plat::pe::FirstResourceOfType(file.substr(0, opt + optSize + 20), plat::pe::kRtVersion, &data),
+              plat::pe::Lookup::NotImage);
+    // Two data directories only: the resource directory (the third) is not there.
+    const std::size_t dirCount = opt + ((U32At(file, opt) & 0xFFFF) == 0x10B ? 92 : 108);
+    std::string twoDirectories = file;
+    twoDirectories[dirCount] = 2;
+    EXPECT_EQ(plat::pe::FirstResourceOfType(twoDirectories, plat::pe::kRtVersion, &data),
+              plat::pe::Lookup::NoResources);
+}
+
 // Version information is read piece by piece, and only from regular files.
 TEST(RegularFile, OpensOnlyRegularFilesAndReadsWholePiecesInside) {
     pextest::TestMachine m;
@@ -108,6 +134,8 @@ TEST(RegularFile, OpensOnlyRegularFilesAndReadsWholePiecesInside) {
     EXPECT_EQ(bytes, "3456");
     EXPECT_TRUE(file.ReadAt(6, 4, &bytes));
     EXPECT_EQ(bytes, "6789");
+    EXPECT_TRUE(file.ReadAt(9, 1, &bytes));
+    EXPECT_EQ(bytes, "9");
     EXPECT_FALSE(file.ReadAt(8, 3, &bytes));
     EXPECT_FALSE(file.ReadAt(~std::uint64_t{0}, 2, &bytes));
     EXPECT_FALSE(file.Open("C:\\pextest_pieces\\a.bin"));  // already open
