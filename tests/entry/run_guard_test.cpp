@@ -1,0 +1,210 @@
+// One run at a time: a host that calls the library again while a run is in progress (from a
+// progress callback here; from a window message during a [RUN] wait on Windows) is refused
+// without effect, a product run of another process on the same machine is waited for, and the
+// trace file lost by one run is tried again by the next.
+#include <gtest/gtest.h>
+
+#include <filesystem>
+#include <functional>
+#include <map>
+
+#include "entry/run_guard.h"
+#include "entry/update_all.h"
+#include "manifest/manifest_parser.h"
+#include "platform/files.h"
+#include "platform/machine.h"
+#include "platform/paths.h"
+#include "tests/pipeline/pipeline_fixture.h"
+#include "tests/support/lock_holder.h"
+#include "tests/support/test_registry.h"
+
+#ifndef _WIN32
+#include <sys/wait.h>
+#include <unistd.h>
+#endif
+
+using pextest::ContentRow;
+using Lines = std::vector<std::string>;
+
+namespace {
+
+const std::string kRefusedProduct =
+    "CManifestParser: ProcessUpdateInformation, a run is already in progress in this process, returning 1";
+const std::string kRefusedUpdateAll = "UpdateAll, a run is already in progress in this process, returning at once";
+
+// What the host does from its progress callback, once, when the run starts applying a file.
+std::function<void()> g_reenter;
+int g_innerCalls = 0;
+
+bool Outer(CProgressData* progress) {
+    if (g_reenter && std::string(progress->StatusText).rfind("Applying ", 0) == 0) {
+        const std::function<void()> reenter = std::move(g_reenter);
+        g_reenter = nullptr;
+        reenter();
+    }
+    return false;
+}
+
+bool Inner(CProgressData*) {
+    ++g_innerCalls;
+    return false;
+}
+
+class RunGuard : public pextest::PipelineTest {
+protected:
+    void SetUp() override {
+        g_innerCalls = 0;
+        for (const char* name : {"a.dll", "b.dll"}) machine.WriteFile(std::string(kHome) + "\\" + name, "old");
+        Publish({Row("a.dll", "new a", "G"), Row("b.dll", "new b", "G")});
+    }
+    void TearDown() override {
+        g_reenter = nullptr;
+        plat::SetMachineLockWaitCap(plat::kNoMachineLockWaitCap);
+    }
+
+    // Every file below C:\App and C:\Pex with its bytes, and whether the product's content file
+    // entries are in the registry: what a run may change.
+    std::map<std::string, std::string> State() const {
+        std::map<std::string, std::string> state;
+        for (const char* folder : {"App", "Pex"})
+            for (const auto& entry : std::filesystem::recursive_directory_iterator(
+                     std::filesystem::path(plat::paths::ToHost(std::string("C:\\") + folder))))
+                if (entry.is_regular_file())
+                    state[entry.path().string()] = pextest::ReadHostFile(entry.path().string());
+        state["registry entries"] = ContentEntriesPresent() ? "present" : "gone";
+        return state;
+    }
+
+    // Called from the middle of a run, both entries trace their one line and return at once:
+    // nothing on disk or in the registry changes and the host's callback is not called.
+    void ReenterBothEntries(CManifestParser& inner) {
+        const auto before = State();
+        const std::size_t linesBefore = trace.Lines().size();
+        EXPECT_FALSE(UpdateAll(&Inner));
+        EXPECT_EQ(inner.ProcessUpdateInformation(_bstr_t(kProduct), &Inner), 1);
+        const Lines lines = trace.Lines();
+        EXPECT_EQ(Lines(lines.begin() + static_cast<std::ptrdiff_t>(linesBefore), lines.end()),
+                  (Lines{kRefusedUpdateAll, kRefusedProduct}));
+        EXPECT_EQ(State(), before);
+        EXPECT_EQ(g_innerCalls, 0);
+    }
+
+    void ExpectApplied() const {
+        EXPECT_EQ(Installed("a.dll"), "new a");
+        EXPECT_EQ(Installed("b.dll"), "new b");
+        EXPECT_FALSE(ContentEntriesPresent());
+    }
+};
+
+TEST_F(RunGuard, ANestedCallDuringUpdateAllIsRefusedAndTheRunGoesOn) {
+    CManifestParser inner;
+    g_reenter = [&] { ReenterBothEntries(inner); };
+    EXPECT_FALSE(UpdateAll(&Outer));
+    EXPECT_FALSE(g_reenter) << "the callback did not re-enter";
+    ExpectApplied();
+
+    // Runs that follow one another are not nested.
+    Publish({Row("a.dll", "newer a")});
+    EXPECT_EQ(inner.ProcessUpdateInformation(_bstr_t(kProduct), nullptr), 0);
+    EXPECT_EQ(Installed("a.dll"), "newer a");
+}
+
+TEST_F(RunGuard, ANestedCallDuringAParserDrivenByTheHostIsRefused) {
+    CManifestParser outer, inner;
+    g_reenter = [&] { ReenterBothEntries(inner); };
+    EXPECT_EQ(outer.ProcessUpdateInformation(_bstr_t(kProduct), &Outer), 0);
+    EXPECT_FALSE(g_reenter) << "the callback did not re-enter";
+    ExpectApplied();
+}
+
+// A trace file that cannot be opened is lost for the rest of that run only.
+TEST_F(RunGuard, EachRunTriesALostTraceFileAgain) {
+    pextest::TraceCapture later("C:\\Later\\trace.log");
+    TRACE(g_TraceLog, "lost: the folder is missing");
+    EXPECT_FALSE(g_TraceLog.fileOutput);
+    machine.WriteFile("C:\\Later\\other.txt", "");
+    UpdateAll(nullptr);
+    EXPECT_EQ(later.Lines().front(), "UpdateAll, main key is open");
+
+    later.Clear();
+    plat::files::Remove("C:\\Later\\other.txt");
+    ASSERT_TRUE(plat::files::RemoveDirectory("C:\\Later"));
+    TRACE(g_TraceLog, "lost again");
+    machine.WriteFile("C:\\Later\\other.txt", "");
+    CManifestParser parser;  // a host driving a parser alone starts a run too
+    parser.ProcessUpdateInformation(_bstr_t(kProduct), nullptr);
+    EXPECT_EQ(later.Lines().front(), "CManifestParser: ProcessUpdateInformation");
+}
+
+#ifndef _WIN32
+// Another process is in a product run: this one waits (capped here, the bound is minutes), gives
+// the product up as one failure without touching it, and runs once the other process is gone,
+// even killed while it held the lock.
+TEST_F(RunGuard, AProductRunOfAnotherProcessIsWaitedForThenGivenUp) {
+    plat::SetMachineLockWaitCap(0);
+    pextest::ForkedLockHolder other(kProductRunLockName);
+    ASSERT_TRUE(other.Holding());
+    const auto before = State();
+    trace.Clear();
+    {
+        CManifestParser parser;
+        trace.Clear();
+        EXPECT_EQ(parser.ProcessUpdateInformation(_bstr_t(kProduct), &Inner), 1);
+        EXPECT_EQ(trace.Lines(),
+                  (Lines{"CManifestParser: ProcessUpdateInformation, another process is updating this machine, "
+                         "waiting up to 300 seconds",
+                         "CManifestParser: ProcessUpdateInformation, the machine's update lock was not obtained "
+                         "(error 258), returning 1"}));
+    }
+    EXPECT_EQ(g_innerCalls, 0);
+    EXPECT_EQ(State(), before);
+
+    other.Kill();
+    CManifestParser parser;
+    EXPECT_EQ(parser.ProcessUpdateInformation(_bstr_t(kProduct), nullptr), 0);
+    ExpectApplied();
+}
+
+// Two hosts started at once on one machine, each updating every product: each file is applied
+// once, by whichever run comes first, and the other finds nothing left to do.
+TEST_F(RunGuard, TwoProcessesStartedAtOnceApplyEveryFile) {
+    constexpr int kFiles = 120;
+    std::vector<ContentRow> rows;
+    for (int i = 0; i < kFiles; ++i) {
+        const std::string name = "f" + std::to_string(i) + ".dll";
+        machine.WriteFile(std::string(kHome) + "\\" + name, "old");
+        rows.push_back(Row(name, "new " + std::to_string(i), "G" + std::to_string(i % 7)));
+    }
+    Publish(rows);
+    plat::machine::SetRoot(machine.Root());  // each child opens the registry for itself
+    int start[2];
+    ASSERT_EQ(pipe(start), 0);
+    pid_t children[2];
+    for (pid_t& child : children) {
+        child = fork();
+        if (child == 0) {
+            close(start[1]);
+            char go;
+            const bool started = read(start[0], &go, 1) == 0;  // the parent closed its end
+            g_TraceLog.enabled = false;
+            if (started) UpdateAll(nullptr);
+            _exit(started ? 0 : 1);
+        }
+    }
+    close(start[0]);
+    close(start[1]);  // both children start now
+    for (pid_t child : children) {
+        int status = -1;
+        waitpid(child, &status, 0);
+        EXPECT_TRUE(WIFEXITED(status) && WEXITSTATUS(status) == 0);
+    }
+    int old = 0;
+    for (int i = 0; i < kFiles; ++i)
+        old += Installed("f" + std::to_string(i) + ".dll") != "new " + std::to_string(i) ? 1 : 0;
+    EXPECT_EQ(old, 0) << "targets left without their update";
+    EXPECT_FALSE(plat::files::Exists(kContent));
+    EXPECT_FALSE(ContentEntriesPresent());
+}
+#endif
+
+}  // namespace

@@ -1,0 +1,66 @@
+// The machine lock: one holder at a time among all the threads and processes of a machine, a
+// bounded wait that tests can cap, and no lock outliving the process that held it.
+#include "platform/machine_lock.h"
+
+#include <gtest/gtest.h>
+
+#include <future>
+
+#include "platform/errors.h"
+#include "tests/support/lock_holder.h"
+#include "tests/support/test_machine.h"
+
+namespace {
+
+constexpr char kName[] = "Vantric.PexTest.Lock";
+
+// Whether a fresh lock object on another thread gets the lock within milliseconds, and the
+// last error when it does not.
+std::pair<bool, std::uint32_t> AcquireElsewhere(const char* name, std::uint32_t milliseconds) {
+    return std::async(std::launch::async, [=] {
+               plat::MachineLock other(name);
+               const bool held = other.Acquire(milliseconds);
+               return std::make_pair(held, held ? 0u : plat::LastError());
+           }).get();
+}
+
+class MachineLockTest : public ::testing::Test {
+protected:
+    void TearDown() override { plat::SetMachineLockWaitCap(plat::kNoMachineLockWaitCap); }
+    pextest::TestMachine machine;
+};
+
+TEST_F(MachineLockTest, OneHolderAtATimeUntilItReleases) {
+    plat::MachineLock lock(kName);
+    ASSERT_TRUE(lock.Acquire(0));
+    EXPECT_TRUE(lock.Acquire(0)) << "held already";
+    EXPECT_EQ(AcquireElsewhere(kName, 50), std::make_pair(false, std::uint32_t{plat::kErrorWaitTimeout}));
+    EXPECT_TRUE(AcquireElsewhere("Vantric.PexTest.Other", 0).first) << "another name is another lock";
+
+    // A wait of ten minutes, capped for tests, gives up at once.
+    plat::SetMachineLockWaitCap(0);
+    EXPECT_FALSE(AcquireElsewhere(kName, 10 * 60 * 1000).first);
+
+    lock.Release();
+    EXPECT_FALSE(lock.Held());
+    EXPECT_TRUE(AcquireElsewhere(kName, 0).first);
+    {
+        plat::MachineLock scoped(kName);
+        ASSERT_TRUE(scoped.Acquire(0));
+    }
+    EXPECT_TRUE(AcquireElsewhere(kName, 0).first) << "the destructor releases";
+}
+
+#ifndef _WIN32
+// A holder that is killed leaves the lock free (processes need fork: the emulated machine only).
+TEST_F(MachineLockTest, ALockDiesWithTheProcessThatHeldIt) {
+    pextest::ForkedLockHolder holder(kName);
+    ASSERT_TRUE(holder.Holding());
+    plat::MachineLock lock(kName);
+    EXPECT_FALSE(lock.Acquire(0)) << "the other process holds it";
+    holder.Kill();
+    EXPECT_TRUE(lock.Acquire(0)) << "a killed holder left the lock held";
+}
+#endif
+
+}  // namespace
