@@ -124,7 +124,7 @@ TEST_F(RunGuard, EachRunTriesALostTraceFileAgain) {
     EXPECT_FALSE(g_TraceLog.fileOutput);
     machine.WriteFile("C:\\Later\\other.txt", "");
     UpdateAll(nullptr);
-    EXPECT_EQ(later.Lines().front(), "UpdateAll, main key is open");
+    EXPECT_TRUE(later.Contains("UpdateAll, main key is open"));
 
     later.Clear();
     plat::files::Remove("C:\\Later\\other.txt");
@@ -133,7 +133,7 @@ TEST_F(RunGuard, EachRunTriesALostTraceFileAgain) {
     machine.WriteFile("C:\\Later\\other.txt", "");
     CManifestParser parser;  // a host driving a parser alone starts a run too
     parser.ProcessUpdateInformation(_bstr_t(kProduct), nullptr);
-    EXPECT_EQ(later.Lines().front(), "CManifestParser: ProcessUpdateInformation");
+    EXPECT_TRUE(later.Contains("CManifestParser: ProcessUpdateInformation"));
 }
 
 #ifndef _WIN32
