@@ -82,7 +82,7 @@ ProductRun::ProductRun() : lock_(kProductRunLockName) {
 
 ProductRun::~ProductRun() {
     if (!entered_) return;
-    lock_.Release();
+    lock_.Release();  // before the next product run of this process may ask for it
     RunState& state = State();
     const std::lock_guard<std::mutex> hold(state.mutex);
     state.product = false;

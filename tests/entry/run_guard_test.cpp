@@ -32,12 +32,14 @@ const std::string kRefusedProduct =
     "CManifestParser: ProcessUpdateInformation, a run is already in progress in this process, returning 1";
 const std::string kRefusedUpdateAll = "UpdateAll, a run is already in progress in this process, returning at once";
 
-// What the host does from its progress callback, once, when the run starts applying a file.
+// What the host does from its progress callback, once, at the first report whose status text
+// starts with g_reenterAt (empty: the first report of all).
 std::function<void()> g_reenter;
+std::string g_reenterAt;
 int g_innerCalls = 0;
 
 bool Outer(CProgressData* progress) {
-    if (g_reenter && std::string(progress->StatusText).rfind("Applying ", 0) == 0) {
+    if (g_reenter && std::string(progress->StatusText).rfind(g_reenterAt, 0) == 0) {
         const std::function<void()> reenter = std::move(g_reenter);
         g_reenter = nullptr;
         reenter();
@@ -98,10 +100,17 @@ protected:
 
 TEST_F(RunGuard, ANestedCallDuringUpdateAllIsRefusedAndTheRunGoesOn) {
     CManifestParser inner;
-    g_reenter = [&] { ReenterBothEntries(inner); };
-    EXPECT_FALSE(UpdateAll(&Outer));
-    EXPECT_FALSE(g_reenter) << "the callback did not re-enter";
-    ExpectApplied();
+    // In a product run, with backups made; and between products, at UpdateAll's own report of
+    // the number of products.
+    for (const char* at : {"Applying ", ""}) {
+        SCOPED_TRACE(at);
+        Publish({Row("a.dll", "new a", "G"), Row("b.dll", "new b", "G")});
+        g_reenterAt = at;
+        g_reenter = [&] { ReenterBothEntries(inner); };
+        EXPECT_FALSE(UpdateAll(&Outer));
+        EXPECT_FALSE(g_reenter) << "the callback did not re-enter";
+        ExpectApplied();
+    }
 
     // Runs that follow one another are not nested.
     Publish({Row("a.dll", "newer a")});
@@ -111,6 +120,7 @@ TEST_F(RunGuard, ANestedCallDuringUpdateAllIsRefusedAndTheRunGoesOn) {
 
 TEST_F(RunGuard, ANestedCallDuringAParserDrivenByTheHostIsRefused) {
     CManifestParser outer, inner;
+    g_reenterAt = "Applying ";
     g_reenter = [&] { ReenterBothEntries(inner); };
     EXPECT_EQ(outer.ProcessUpdateInformation(_bstr_t(kProduct), &Outer), 0);
     EXPECT_FALSE(g_reenter) << "the callback did not re-enter";

@@ -4,6 +4,7 @@
 
 #include <gtest/gtest.h>
 
+#include <filesystem>
 #include <future>
 
 #include "platform/errors.h"
@@ -60,6 +61,15 @@ TEST_F(MachineLockTest, ALockDiesWithTheProcessThatHeldIt) {
     EXPECT_FALSE(lock.Acquire(0)) << "the other process holds it";
     holder.Kill();
     EXPECT_TRUE(lock.Acquire(0)) << "a killed holder left the lock held";
+}
+
+// A lock whose file cannot be made is not held, and says why (not a time-out).
+TEST_F(MachineLockTest, ALockThatCannotBeMadeIsNotHeld) {
+    std::filesystem::create_directories(machine.Root() + "/" + kName + ".lock");
+    plat::MachineLock lock(kName);
+    EXPECT_FALSE(lock.Acquire(0));
+    EXPECT_FALSE(lock.Held());
+    EXPECT_NE(plat::LastError(), plat::kErrorWaitTimeout);
 }
 #endif
 
