@@ -98,16 +98,24 @@ protected:
     }
 };
 
-TEST_F(RunGuard, ANestedCallDuringUpdateAllIsRefusedAndTheRunGoesOn) {
-    CManifestParser inner;
-    // In a product run, with backups made; and between products, at UpdateAll's own report of
-    // the number of products.
-    for (const char* at : {"Applying ", ""}) {
-        SCOPED_TRACE(at);
+// The outer run is UpdateAll, re-entered in a product run (backups made) and between products
+// (at its own report of the number of products), or a parser that the host drives alone.
+TEST_F(RunGuard, ANestedCallIsRefusedAndTheRunGoesOn) {
+    CManifestParser outer, inner;
+    const struct {
+        const char* at;
+        bool byParser;
+    } cases[] = {{"Applying ", false}, {"", false}, {"Applying ", true}};
+    for (const auto& c : cases) {
+        SCOPED_TRACE(std::string(c.at) + (c.byParser ? "by the parser" : "by UpdateAll"));
         Publish({Row("a.dll", "new a", "G"), Row("b.dll", "new b", "G")});
-        g_reenterAt = at;
+        g_reenterAt = c.at;
         g_reenter = [&] { ReenterBothEntries(inner); };
-        EXPECT_FALSE(UpdateAll(&Outer));
+        if (c.byParser) {
+            EXPECT_EQ(outer.ProcessUpdateInformation(_bstr_t(kProduct), &Outer), 0);
+        } else {
+            EXPECT_FALSE(UpdateAll(&Outer));
+        }
         EXPECT_FALSE(g_reenter) << "the callback did not re-enter";
         ExpectApplied();
     }
@@ -116,15 +124,6 @@ TEST_F(RunGuard, ANestedCallDuringUpdateAllIsRefusedAndTheRunGoesOn) {
     Publish({Row("a.dll", "newer a")});
     EXPECT_EQ(inner.ProcessUpdateInformation(_bstr_t(kProduct), nullptr), 0);
     EXPECT_EQ(Installed("a.dll"), "newer a");
-}
-
-TEST_F(RunGuard, ANestedCallDuringAParserDrivenByTheHostIsRefused) {
-    CManifestParser outer, inner;
-    g_reenterAt = "Applying ";
-    g_reenter = [&] { ReenterBothEntries(inner); };
-    EXPECT_EQ(outer.ProcessUpdateInformation(_bstr_t(kProduct), &Outer), 0);
-    EXPECT_FALSE(g_reenter) << "the callback did not re-enter";
-    ExpectApplied();
 }
 
 // A trace file that cannot be opened is lost for the rest of that run only.

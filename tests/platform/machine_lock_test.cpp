@@ -1,5 +1,5 @@
-// The machine lock: one holder at a time among all the threads and processes of a machine, a
-// bounded wait that tests can cap, and no lock outliving the process that held it.
+// The machine lock: one holder at a time among all the threads of a machine's processes, and a
+// bounded wait that tests can cap. A holder killed with its lock: entry/run_guard_test.
 #include "platform/machine_lock.h"
 
 #include <gtest/gtest.h>
@@ -8,7 +8,6 @@
 #include <future>
 
 #include "platform/errors.h"
-#include "tests/support/lock_holder.h"
 #include "tests/support/test_machine.h"
 
 namespace {
@@ -53,16 +52,6 @@ TEST_F(MachineLockTest, OneHolderAtATimeUntilItReleases) {
 }
 
 #ifndef _WIN32
-// A holder that is killed leaves the lock free (processes need fork: the emulated machine only).
-TEST_F(MachineLockTest, ALockDiesWithTheProcessThatHeldIt) {
-    pextest::ForkedLockHolder holder(kName);
-    ASSERT_TRUE(holder.Holding());
-    plat::MachineLock lock(kName);
-    EXPECT_FALSE(lock.Acquire(0)) << "the other process holds it";
-    holder.Kill();
-    EXPECT_TRUE(lock.Acquire(0)) << "a killed holder left the lock held";
-}
-
 // A lock whose file cannot be made is not held, and says why (not a time-out).
 TEST_F(MachineLockTest, ALockThatCannotBeMadeIsNotHeld) {
     std::filesystem::create_directories(machine.Root() + "/" + kName + ".lock");
