@@ -15,10 +15,10 @@
 #include "platform/machine.h"
 #include "platform/paths.h"
 #include "tests/pipeline/pipeline_fixture.h"
-#include "tests/support/lock_holder.h"
 #include "tests/support/test_registry.h"
 
 #ifndef _WIN32
+#include <signal.h>
 #include <sys/wait.h>
 #include <unistd.h>
 #endif
@@ -146,12 +146,44 @@ TEST_F(RunGuard, EachRunTriesALostTraceFileAgain) {
 }
 
 #ifndef _WIN32
+// Another process of the machine that holds the product-run lock until it is killed.
+class OtherProcessHoldingTheLock {
+public:
+    OtherProcessHoldingTheLock() {
+        int ready[2];
+        if (pipe(ready) != 0) return;
+        child_ = fork();
+        if (child_ == 0) {
+            plat::MachineLock lock(kProductRunLockName);
+            const char held = lock.Acquire(0) ? 'y' : 'n';
+            while (write(ready[1], &held, 1) == 1) pause();  // until killed
+            _exit(1);  // no destructors: the parent's test objects are not the child's
+        }
+        char held = 'n';
+        holding_ = child_ > 0 && read(ready[0], &held, 1) == 1 && held == 'y';
+        close(ready[0]);
+        close(ready[1]);
+    }
+    ~OtherProcessHoldingTheLock() { Kill(); }
+    bool Holding() const { return holding_; }
+    void Kill() {  // as a crash would end it
+        if (child_ <= 0) return;
+        kill(child_, SIGKILL);
+        waitpid(child_, nullptr, 0);
+        child_ = -1;
+    }
+
+private:
+    pid_t child_ = -1;
+    bool holding_ = false;
+};
+
 // Another process is in a product run: this one waits (capped here, the bound is minutes), gives
 // the product up as one failure without touching it, and runs once the other process is gone,
 // even killed while it held the lock.
 TEST_F(RunGuard, AProductRunOfAnotherProcessIsWaitedForThenGivenUp) {
     plat::SetMachineLockWaitCap(0);
-    pextest::ForkedLockHolder other(kProductRunLockName);
+    OtherProcessHoldingTheLock other;
     ASSERT_TRUE(other.Holding());
     const auto before = State();
     trace.Clear();
