@@ -2,6 +2,7 @@
 #include <cstdlib>
 
 #include "diag/trace_log.h"
+#include "entry/run_guard.h"
 #include "manifest/manifest_parser.h"
 #include "model/upgrade_status.h"
 
@@ -12,6 +13,8 @@ bool NonZero(const std::string& cell) { return std::atol(cell.c_str()) != 0; }
 }  // namespace
 
 std::int32_t CManifestParser::ProcessUpdateInformation(_bstr_t project, ProgressCallback callback) {
+    const ProductRun run;  // one run at a time in the process, one product run on the machine
+    if (!run.Entered()) return ProductRun::kRefusedResult;
     TRACE(g_TraceLog, "CManifestParser: ProcessUpdateInformation");
     if (callback) {
         g_ProgressData.SetStatusText("Analyzing data...");
