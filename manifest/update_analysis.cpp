@@ -20,8 +20,9 @@ std::int32_t CManifestParser::ProcessUpdateInformation(_bstr_t project, Progress
     std::int32_t result = 0;
     bool present = false;
     const std::string name = std::string(project);
+    ResetRunState();
     if (!LoadManifest(name, &present)) {
-        DiscardContentFile();
+        result = RejectContentFile();
         TRACE(g_TraceLog, "CManifestParser: ProcessUpdateInformation, Unable to load Content file");
     } else if (!present) {
         TRACE(g_TraceLog, "CManifestParser: ProcessUpdateInformation, No content file exists, nothing to do");

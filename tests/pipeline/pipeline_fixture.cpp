@@ -23,9 +23,10 @@ std::string Join(const std::vector<std::string>& cells) {
 
 }  // namespace
 
-void PipelineTest::Publish(const std::vector<ContentRow>& rows, const std::string& mode) {
-    const std::string section = std::string("Software\\Vantric\\Pex\\") + kProduct;
-    SetRegText(reg::kLocalMachine, section, "ContentFileName", kContent);
+void PipelineTest::Publish(const std::vector<ContentRow>& rows, const std::string& mode, const std::string& product,
+                           const std::string& content) {
+    const std::string section = "Software\\Vantric\\Pex\\" + product;
+    SetRegText(reg::kLocalMachine, section, "ContentFileName", content);
     SetRegText(reg::kLocalMachine, section, "ContentFileMode", mode);
     SetRegText(reg::kLocalMachine, section, "ContentFileTarget", "");
     std::string text = Join(kColumns);
@@ -37,7 +38,7 @@ void PipelineTest::Publish(const std::vector<ContentRow>& rows, const std::strin
         }
         text += Join(cells);
     }
-    machine.WriteFile(kContent, text);
+    machine.WriteFile(content, text);
 }
 
 ContentRow PipelineTest::Row(const std::string& fileName, const std::string& bytes, const std::string& group,

@@ -23,7 +23,8 @@ protected:
     static constexpr const char* kHome = "C:\\App";
 
     // Registers the product with its content file and mode; writes the content file.
-    void Publish(const std::vector<ContentRow>& rows, const std::string& mode = "");
+    void Publish(const std::vector<ContentRow>& rows, const std::string& mode = "",
+                 const std::string& product = kProduct, const std::string& content = kContent);
     // A row installing fileName from a download of bytes (C:\Pex\cache\<fileName>.new), in
     // status Downloaded.
     ContentRow Row(const std::string& fileName, const std::string& bytes, const std::string& group = "",
