@@ -125,6 +125,7 @@ TEST(ContentTableAccess, ColumnsByNameAndCellsOutsideTheTable) {
     table.LoadFromText("FileName,UpgradeStatus,FILENAME\r\nf,s,g\r\n");
     EXPECT_EQ(0, table.ColumnIndex("filename"));
     EXPECT_EQ(-1, table.ColumnIndex("File"));
+    EXPECT_EQ(-1, table.ColumnIndex("Fxxxxxxx"));
     EXPECT_EQ("", table.Cell(1, 0));
     EXPECT_EQ("", table.Field(0, "Command"));
     EXPECT_FALSE(table.SetCell(1, 0, "x"));

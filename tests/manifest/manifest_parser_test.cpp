@@ -191,6 +191,21 @@ TEST_F(ManifestParser, RowScriptsRunUnescapedAndFailuresDoNotStopTheLoad) {
     EXPECT_TRUE(trace.Contains("Error Creating Plan"));
 }
 
+// A parser driven for a second product keeps nothing of the first one's content file, also
+// when the second product has none.
+TEST_F(ManifestParser, ARunKeepsNothingOfTheContentFileOfTheRunBefore) {
+    Publish("MandatoryOnly", "FileName,UpgradeStatus\r\na.dll,Skipped\r\n");
+    EXPECT_EQ(parser.ProcessUpdateInformation(_bstr_t("Zendor32"), nullptr), 0);
+    ASSERT_TRUE(parser.MandatoryOnly());
+    pextest::CreateRegKey(reg::kLocalMachine, "Software\\Vantric\\Pex\\Orlandel");
+    EXPECT_EQ(parser.ProcessUpdateInformation(_bstr_t("Orlandel"), nullptr), 0);
+    EXPECT_EQ(parser.Table().ColumnCount(), 0u);
+    EXPECT_EQ(parser.ContentFilePath(), "");
+    EXPECT_EQ(parser.ContentFileTarget(), "");
+    EXPECT_FALSE(parser.MandatoryOnly());
+    EXPECT_FALSE(parser.MoveToRow(0));
+}
+
 bool EntriesPresent() {
     std::string bytes;
     for (const char* name : {"ContentFileName", "ContentFileMode", "ContentFileTarget"}) {
