@@ -237,6 +237,14 @@ TEST_F(ManifestParser, AnUnloadableContentFileIsKeptAsideAndCounted) {
     EXPECT_TRUE(trace.Contains("CManifestParser: ProcessUpdateInformation, content file '" + std::string(kContent) +
                                "' rejected: there is no column UpgradeStatus"));
     EXPECT_EQ(machine.ReadFile(kept), "FileName,Status\r\na.dll,Downloaded\r\n");
+
+    // A missing file: nothing to keep, the entries go, and there is no failure to count.
+    Publish("", "");
+    ASSERT_TRUE(plat::files::Remove(kContent));
+    ASSERT_TRUE(plat::files::Remove(kept));
+    EXPECT_EQ(parser.ProcessUpdateInformation(_bstr_t("Zendor32"), nullptr), 0);
+    EXPECT_FALSE(EntriesPresent());
+    EXPECT_FALSE(plat::files::Exists(kept));
 }
 
 // A move that fails never costs the file: it stays, with the entries that name it, for the
@@ -252,15 +260,6 @@ TEST_F(ManifestParser, ARejectedFileThatCannotBeMovedStaysInPlace) {
     EXPECT_TRUE(EntriesPresent());
     EXPECT_TRUE(trace.Contains("CManifestParser: ProcessUpdateInformation, rejected content file not moved to '" +
                                std::string(kContent) + ".rejected' (error 32), left in place"));
-}
-
-// Nothing to keep: the entries go, and there is no failure to count.
-TEST_F(ManifestParser, AMissingContentFileIsDiscarded) {
-    Publish("", "");
-    ASSERT_TRUE(plat::files::Remove(kContent));
-    EXPECT_EQ(parser.ProcessUpdateInformation(_bstr_t("Zendor32"), nullptr), 0);
-    EXPECT_FALSE(EntriesPresent());
-    EXPECT_FALSE(plat::files::Exists(std::string(kContent) + ".rejected"));
 }
 
 }  // namespace
