@@ -65,6 +65,11 @@ std::int32_t LoadContentRows(CContentTable& table, const std::string& path,
                              const std::string& defaultDirectory) {
     const std::int32_t hr = table.LoadFromFile(path, true, ',');
     if (hr < 0) return hr;
+    // Without these the analysis would take every row as a file without a name, or never as
+    // downloaded, and a run would end by discarding rows it never looked at.
+    for (const char* column : {"FileName", "UpgradeStatus"}) {
+        if (table.ColumnIndex(column) < 0) return table.FailLoad(std::string("there is no column ") + column);
+    }
     NormalizeUpgradeStatus(table);
     ResolveHomeDirs(table, defaultDirectory);
     return EvaluateDynamicFields(table);

@@ -23,10 +23,11 @@ std::int32_t CManifestParser::ProcessUpdateInformation(_bstr_t project, Progress
     std::int32_t result = 0;
     bool present = false;
     const std::string name = std::string(project);
+    ResetRunState();
     const bool loaded = LoadManifest(name, &present);
     if (present) result = static_cast<std::int32_t>(RecoverEarlierRun(loaded ? &table_ : nullptr));
     if (!loaded) {
-        DiscardContentFile();
+        result += RejectContentFile();
         TRACE(g_TraceLog, "CManifestParser: ProcessUpdateInformation, Unable to load Content file");
     } else if (!present) {
         TRACE(g_TraceLog, "CManifestParser: ProcessUpdateInformation, No content file exists, nothing to do");
