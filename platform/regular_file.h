@@ -24,8 +24,9 @@ public:
     bool ReadAt(std::uint64_t at, std::size_t n, std::string* bytes) const override;
 
 private:
-    int fd_ = -1;             // posix backend
-    void* handle_ = nullptr;  // win32 backend
+    // One of the two is used, by the backend built.
+    [[maybe_unused]] int fd_ = -1;             // posix backend
+    [[maybe_unused]] void* handle_ = nullptr;  // win32 backend
     std::uint64_t size_ = 0;
 };
 
