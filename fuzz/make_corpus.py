@@ -38,6 +38,12 @@ write("content_table", "no_header_semicolon", b"\x03" + b"x;\"y\";z\rp;q\r")
 write("content_table", "too_long_row", b"\x00" + b"A,B\r\n1,2,3\r\n")
 # A script assigning a column the file lacks: nothing is stored, the plan still succeeds.
 write("content_table", "missing_column", b"\x08" + b"FileName,DynamicFieldInfo\r\na.dll,FORCED = TRUE\r\n")
+# Short rows under a header of 5,000 columns: once filled up, a billion cells (630 KB on disk).
+write("content_table", "wide_header_short_rows",
+      b"\x00" + "".join("c%d," % i for i in range(5000)).encode() + b"\r\n" + b"x\r\n" * 200000)
+# A byte-order mark, quoted and spaced header names, and a blank line ending in LF alone.
+write("content_table", "bom_quoted_header",
+      b"\x08" + b"\xef\xbb\xbf\"FileName\", UpgradeStatus ,HomeDir\r\na.dll,Downloaded,C:\\App\n\nb.dll,Skipped,\r\n")
 
 # --- dynamic-field texts: first byte picks the row's cells ---
 SCRIPTS = {
