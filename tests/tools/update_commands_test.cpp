@@ -58,6 +58,32 @@ TEST(UpdateCommands, ScriptSaysWhatARowCouldNotStore) {
                          "executed\n");
 }
 
+// A text that does not parse says where: the token the parser could not take, the end of a
+// text that ended too early, the line of a text of several lines.
+TEST(UpdateCommands, ScriptMarksWhereATextFailsToParse) {
+    pextest::TestMachine machine;
+    const struct {
+        const char* args;
+        const char* mark;
+    } cases[] = {
+        {"script 'FORCED = TRUE FALSE; SNOOZEABLE = 1'",
+         "at column 15:\n  FORCED = TRUE FALSE; SNOOZEABLE = 1\n                ^^^^^\n"},
+        {"script 'FORCED = IIFB(TRUE, '", "at column 21:\n  FORCED = IIFB(TRUE, \n                      ^\n"},
+        {"script \"$(printf 'FORCED = TRUE;\\n\\tSNOOZEABLE = = 1')\"",
+         "at line 2, column 15:\n  \tSNOOZEABLE = = 1\n  \t             ^\n"},
+        {"script '= TRUE'", "at column 1:\n  = TRUE\n  ^\n"},
+    };
+    for (const auto& c : cases) {
+        const pextest::CommandOutcome outcome = RunPex(machine, c.args);
+        EXPECT_EQ(outcome.exit, 1) << c.args;
+        EXPECT_NE(outcome.out.find(std::string("syntax error\n")), std::string::npos) << outcome.out;
+        EXPECT_NE(outcome.out.find(std::string(c.mark) + "not valid: the text does not parse\n"), std::string::npos)
+            << outcome.out;
+    }
+    // A text that parses carries no mark, even after one that did not.
+    EXPECT_EQ(RunPex(machine, "script 'FORCED = TRUE'").out, "item 1: SET(FORCED, TRUE)\nvalid\n");
+}
+
 TEST(UpdateCommands, AllAndProductRunTheLibraryAndExplainWhereTheLogIs) {
     pextest::TestMachine machine;
     pextest::SetRegText(reg::kLocalMachine, "Software\\Vantric\\Pex\\Orlandel", "ContentFileName",
