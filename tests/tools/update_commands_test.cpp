@@ -84,6 +84,27 @@ TEST(UpdateCommands, ScriptMarksWhereATextFailsToParse) {
     EXPECT_EQ(RunPex(machine, "script 'FORCED = TRUE'").out, "item 1: SET(FORCED, TRUE)\nvalid\n");
 }
 
+// The exit status says whether something needs attention; a product that is not registered
+// cannot be reported.
+TEST(UpdateCommands, StatusExitsWithWhetherSomethingIsPendingOrFailed) {
+    pextest::TestMachine machine;
+    pextest::CommandOutcome none = RunPex(machine, "status");
+    EXPECT_EQ(none.exit, 0) << none.out;
+    EXPECT_EQ(none.out.rfind("No product is registered.\nTrace log: ", 0), 0u) << none.out;
+    pextest::SetRegText(reg::kLocalMachine, "Software\\Vantric\\Pex\\Statusprobe", "ContentFileName",
+                        "C:\\Statusprobe\\content.csv");
+    machine.WriteFile("C:\\Statusprobe\\content.csv", "FileName,UpgradeStatus,HomeDir\r\na.dll,ApplicationFailed,C:\\App\r\n");
+    pextest::CommandOutcome failed = RunPex(machine, "status Statusprobe");
+    EXPECT_EQ(failed.exit, 1);
+    EXPECT_NE(failed.out.find("  not applied: row 0 a.dll in C:\\App: ApplicationFailed\n"), std::string::npos) << failed.out;
+    EXPECT_EQ(RunPex(machine, "status --json").exit, 1);
+    machine.WriteFile("C:\\Statusprobe\\content.csv", "FileName,UpgradeStatus\r\na.dll,AppliedSuccessfully\r\n");
+    EXPECT_EQ(RunPex(machine, "status").exit, 0);
+    pextest::CommandOutcome unknown = RunPex(machine, "status Nobody --json");
+    EXPECT_EQ(unknown.exit, 2);
+    EXPECT_NE(unknown.out.find("\"error\": \"no product 'Nobody' is registered"), std::string::npos) << unknown.out;
+}
+
 TEST(UpdateCommands, AllAndProductRunTheLibraryAndExplainWhereTheLogIs) {
     pextest::TestMachine machine;
     pextest::SetRegText(reg::kLocalMachine, "Software\\Vantric\\Pex\\Orlandel", "ContentFileName",
