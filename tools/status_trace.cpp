@@ -27,8 +27,10 @@ const char kKeptAside[] = "CManifestParser: ProcessUpdateInformation, rejected c
 // Words of the lines that explain a failure: the failed copy or command, the rollback, a
 // content file that did not load, a row the recovery could not finish.
 const char* const kExplaining[] = {"fail", "unable", "roll", "rejected", "could not", "not successfull", "error"};
-// The analysis says this of every row that waits to be applied: no explanation.
-const char kAnalysisNoise[] = "UpgradeStatus is downloaded or application failed";
+// Lines with those words that every run may write and that explain nothing: the analysis of a
+// row that waits to be applied, an optional key that is missing, a row without an update date.
+const char* const kNoise[] = {"UpgradeStatus is downloaded or application failed", "RegOpenKeyEx failed with 2",
+                              "Unable to parse provided date time string ''"};
 
 struct LogLine {
     std::string stamp;    // "YYYY/MM/DD - HH:MM:SS.mmm"; empty on the later lines of a multi-line trace
@@ -63,7 +65,9 @@ std::vector<LogLine> ReadLog(const std::string& path) {
 bool Explains(const std::string& message) {
     std::string lower = message;
     std::transform(lower.begin(), lower.end(), lower.begin(), [](unsigned char c) { return std::tolower(c); });
-    if (message.find(kAnalysisNoise) != std::string::npos) return false;
+    if (std::any_of(std::begin(kNoise), std::end(kNoise),
+                    [&](const char* noise) { return message.find(noise) != std::string::npos; }))
+        return false;
     return std::any_of(std::begin(kExplaining), std::end(kExplaining),
                        [&](const char* word) { return lower.find(word) != std::string::npos; });
 }
