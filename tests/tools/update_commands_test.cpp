@@ -69,8 +69,10 @@ TEST(UpdateCommands, ScriptMarksWhereATextFailsToParse) {
         {"script 'FORCED = TRUE FALSE; SNOOZEABLE = 1'",
          "at column 15:\n  FORCED = TRUE FALSE; SNOOZEABLE = 1\n                ^^^^^\n"},
         {"script 'FORCED = IIFB(TRUE, '", "at column 21:\n  FORCED = IIFB(TRUE, \n                      ^\n"},
+#ifndef _WIN32  // the Windows command line takes no line feed in an argument
         {"script \"$(printf 'FORCED = TRUE;\\n\\tSNOOZEABLE = = 1')\"",
          "at line 2, column 15:\n  \tSNOOZEABLE = = 1\n  \t             ^\n"},
+#endif
         {"script '= TRUE'", "at column 1:\n  = TRUE\n  ^\n"},
     };
     for (const auto& c : cases) {
