@@ -13,7 +13,7 @@ set -euo pipefail
 cd "$(dirname "$0")"
 
 PACKAGES=(cmake make g++ pkg-config libgtest-dev libgmock-dev libsqlite3-dev zlib1g-dev flex bison
-          mscompress libmspack-dev libssl-dev)
+          mscompress libmspack-dev libssl-dev nlohmann-json3-dev)
 BUILD=build
 
 install_missing() {
@@ -69,7 +69,7 @@ cmd_demo() {
 
 # The Windows build: mingw-w64 (posix threads), zlib and GoogleTest's sources for it, and Wine.
 WINDOWS_PACKAGES=(cmake make mingw-w64 g++-mingw-w64-x86-64-posix libz-mingw-w64-dev googletest
-                  flex bison wine wine64)
+                  flex bison wine wine64 nlohmann-json3-dev)
 WINDOWS_BUILD=build-win
 # Seconds one test program may run under Wine before it counts as failed.
 WINE_TEST_TIMEOUT=${PEX_WINE_TEST_TIMEOUT:-300}

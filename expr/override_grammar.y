@@ -19,6 +19,7 @@ int pexexprlex();
 
 #include "expr/expression_tree.h"
 #include "expr/override_parser.h"
+#include "expr/scanner_control.h"
 
 /* Fixed stacks of 200 entries, never grown. */
 #define YYINITDEPTH 200
@@ -28,7 +29,13 @@ int pexexprlex();
    be a stack overflow, reported under its own name. */
 #define YY_(msg) (std::strcmp((msg), "memory exhausted") == 0 ? "parser stack overflow" : (msg))
 
-static void pexexprerror(const char* message) { std::printf("%s\n", message); }
+/* The look-ahead token, defined by the generated parser below. */
+extern int pexexprchar;
+
+static void pexexprerror(const char* message) {
+    std::printf("%s\n", message);
+    ScannerNoteSyntaxError(pexexprchar <= 0);
+}
 %}
 
 %define api.prefix {pexexpr}

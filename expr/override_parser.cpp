@@ -35,6 +35,8 @@ private:
     std::vector<char> buffer_;
 };
 
+SyntaxErrorSpan g_syntaxError;
+
 int Refuse(int result) {
     std::printf("%s\n", ParseRefusalMessage(result).c_str());
     return result;
@@ -54,9 +56,14 @@ std::string ParseRefusalMessage(int result) {
 
 void RefuseTooDeep() { throw TreeTooDeep(); }
 
+SyntaxErrorSpan LastSyntaxError() { return g_syntaxError; }
+
+void NoteSyntaxError(const SyntaxErrorSpan& span) { g_syntaxError = span; }
+
 int ParseOverrideText(const std::string& text) {
     // The text is taken as a C string, as the row hands it over: it ends at its first NUL.
     const std::size_t length = std::strlen(text.c_str());
+    g_syntaxError = SyntaxErrorSpan();
     if (length > kMaxScriptLength) return Refuse(kParseTooLong);
     try {
         ScannerSession session(text.c_str(), length);

@@ -31,6 +31,17 @@ constexpr int kMaxExpressionDepth = 256;
 // only this parse. Not reentrant: the scanner and parser state is process-wide.
 int ParseOverrideText(const std::string& text);
 
+// Where the last parse that ended in kParseSyntaxError met the error: byte offsets into its text
+// of the token the parser could not take ([begin, end)), or begin == end == the text's length
+// when the text ended too early. found is false after a parse without a syntax error.
+struct SyntaxErrorSpan {
+    bool found = false;
+    std::size_t begin = 0;
+    std::size_t end = 0;
+};
+SyntaxErrorSpan LastSyntaxError();
+void NoteSyntaxError(const SyntaxErrorSpan& span);  // called by the scanner (internal to expr/)
+
 // The message printed on standard output for kParseTooLong and kParseTooDeep; empty for the
 // other results.
 std::string ParseRefusalMessage(int result);

@@ -12,3 +12,7 @@ void ScannerReset();
 struct ScannerFailure {};
 // Reports a fatal scanner condition on standard error and throws ScannerFailure.
 [[noreturn]] void ScannerFatal(const char* message);
+
+// Marks where the parser met a syntax error, for LastSyntaxError: the text of the token it could
+// not take, or the end of the text when it ran out of input.
+void ScannerNoteSyntaxError(bool atEnd);

@@ -100,6 +100,10 @@ public:
         std::vector<std::string> fields;
     };
 
+    // The rows that an earlier run left pending, with their records since their last U or K, as
+    // Open read them (for reports; a run goes through Recover).
+    const std::map<std::uint32_t, std::vector<Record>>& PendingRecords() const { return pending_; }
+
 private:
     bool Append(std::uint32_t row, const Record& record);
     void Fold(std::uint32_t row, const Record& record);

@@ -5,6 +5,8 @@
 #include <cstdio>
 #include <string>
 
+#include "tools/progress_tracker.h"
+
 namespace pextool {
 
 namespace {
@@ -21,9 +23,14 @@ std::string Bar(std::int64_t done, std::int64_t total, int width) {
     return std::string(static_cast<size_t>(filled), '#') + std::string(static_cast<size_t>(width - filled), '.');
 }
 
+ProgressTracker g_tracker;
+
 void DrawBar(const CProgressData& p) {
-    std::string line = "[" + Bar(p.CurrentStep, p.TotalSteps, 30) + "] " + std::to_string(p.CurrentStep) +
-                       "/" + std::to_string(p.TotalSteps) + " ";
+    const ProgressView view = g_tracker.Observe(p);
+    std::string line = "[" + Bar(view.step, view.stepTotal, 30) + "] " + std::to_string(view.step) + "/" +
+                       (view.stepTotal > 0 ? std::to_string(view.stepTotal) : std::string("?")) + " ";
+    if (view.productCount > 0)
+        line += "product " + std::to_string(view.product) + " of " + std::to_string(view.productCount) + " ";
     if (p.ItemTotalSet && p.ItemTotal > 0 && p.ItemDone < p.ItemTotal)
         line += "[" + Bar(p.ItemDone, p.ItemTotal, 12) + "] ";
     line += p.StatusText;

@@ -1,6 +1,7 @@
 // `pexupdate script "TEXT" [--row CONTENTFILE:N]`: for people who write content files. Parses and
 // checks a dynamic-field text the way the updater does for a row's "DynamicFieldInfo" column,
 // shows what it means and why it would be refused, and can try it on a row of a content file.
+#include <algorithm>
 #include <cstdio>
 #include <cstdlib>
 #include <string>
@@ -9,6 +10,7 @@
 #include "commands/update_services.h"
 #include "expr/execution_plan.h"
 #include "expr/expression_text.h"
+#include "expr/override_parser.h"
 #include "manifest/content_table.h"
 #include "platform/paths.h"
 #include "tools/command.h"
@@ -20,7 +22,9 @@ const char kUsage[] =
     "Parses TEXT as the dynamic-field script of a content-file row (the \"DynamicFieldInfo\"\n"
     "column, after the row's &#x2C; escapes are decoded), checks it against the language's\n"
     "names and types, and prints each assignment of the plan and every validation comment.\n"
-    "A text that does not parse gets the parser's own message (\"syntax error\") first.\n"
+    "A text that does not parse gets the parser's own message (\"syntax error\") first, then\n"
+    "where it went wrong: the column (and line, for a text of several lines), counted from 1,\n"
+    "and the text with the token the parser could not take marked by \"^\" below it.\n"
     "With --row, a valid plan is also executed against row N (counted from 0, as the trace log\n"
     "counts rows) of the content file, and the cells it changed are printed; the file itself is\n"
     "not changed. CONTENTFILE is a Windows path on the machine, or a host path starting with '/'.\n"
@@ -85,6 +89,24 @@ int RunOnRow(ExecutionPlan& plan, const RowChoice& choice) {
     return hr < 0 ? 1 : 0;
 }
 
+// Shows where a text that does not parse went wrong: its line (when it has several) and column,
+// counted from 1 in bytes, and that line with the token the parser could not take marked below it
+// ("^" at the end of the text when it ended too early).
+void PrintSyntaxErrorMark(const std::string& text, const SyntaxErrorSpan& span) {
+    const std::size_t lineStart = text.rfind('\n', span.begin == 0 ? 0 : span.begin - 1);
+    const std::size_t first = span.begin == 0 || lineStart == std::string::npos ? 0 : lineStart + 1;
+    const std::size_t lineEnd = std::min(text.find('\n', span.begin), text.size());
+    const std::size_t line = 1 + static_cast<std::size_t>(std::count(text.begin(), text.begin() + first, '\n'));
+    if (line > 1 || lineEnd < text.size())
+        std::printf("at line %zu, column %zu:\n", line, span.begin - first + 1);
+    else
+        std::printf("at column %zu:\n", span.begin - first + 1);
+    std::string marks;
+    for (std::size_t i = first; i < span.begin; ++i) marks += text[i] == '\t' ? '\t' : ' ';
+    marks.append(std::max<std::size_t>(1, std::min(span.end, lineEnd) - span.begin), '^');
+    std::printf("  %s\n  %s\n", text.substr(first, lineEnd - first).c_str(), marks.c_str());
+}
+
 int RunScript(const std::vector<std::string>& args) {
     const bool help = args.size() == 1 && args[0] == "--help";
     RowChoice choice;
@@ -99,6 +121,7 @@ int RunScript(const std::vector<std::string>& args) {
         std::printf("item %zu: %s\n", i + 1, ExpressionText(plan.Items()[i]).c_str());
     }
     if (!parsed) {
+        if (LastSyntaxError().found) PrintSyntaxErrorMark(args[0], LastSyntaxError());
         std::printf("not valid: the text does not parse\n");
         return 1;
     }

@@ -12,6 +12,7 @@
 #include "platform/paths.h"
 #include "tools/command.h"
 #include "tools/host_progress.h"
+#include "tools/status_report.h"
 
 namespace pextool {
 
@@ -42,8 +43,7 @@ bool ParseOptions(const std::vector<std::string>& args, size_t operands, const c
 // Where the library writes its trace log: the folder "log" beside Mendler.dll.
 void PrintLogLocation(const std::string& libraryPath, bool quiet) {
     if (quiet || libraryPath.empty()) return;
-    const plat::paths::PathParts parts = plat::paths::SplitPath(libraryPath);
-    const std::string log = parts.drive + parts.dir + "log\\pex_support_mendler.log";
+    const std::string log = status::TraceLogBeside(libraryPath);
     std::printf("Trace log: %s (%s)\n", log.c_str(), plat::paths::ToHost(log).c_str());
 }
 

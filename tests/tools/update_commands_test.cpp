@@ -58,6 +58,55 @@ TEST(UpdateCommands, ScriptSaysWhatARowCouldNotStore) {
                          "executed\n");
 }
 
+// A text that does not parse says where: the token the parser could not take, the end of a
+// text that ended too early, the line of a text of several lines.
+TEST(UpdateCommands, ScriptMarksWhereATextFailsToParse) {
+    pextest::TestMachine machine;
+    const struct {
+        const char* args;
+        const char* mark;
+    } cases[] = {
+        {"script 'FORCED = TRUE FALSE; SNOOZEABLE = 1'",
+         "at column 15:\n  FORCED = TRUE FALSE; SNOOZEABLE = 1\n                ^^^^^\n"},
+        {"script 'FORCED = IIFB(TRUE, '", "at column 21:\n  FORCED = IIFB(TRUE, \n                      ^\n"},
+#ifndef _WIN32  // the Windows command line takes no line feed in an argument
+        {"script \"$(printf 'FORCED = TRUE;\\n\\tSNOOZEABLE = = 1')\"",
+         "at line 2, column 15:\n  \tSNOOZEABLE = = 1\n  \t             ^\n"},
+#endif
+        {"script '= TRUE'", "at column 1:\n  = TRUE\n  ^\n"},
+    };
+    for (const auto& c : cases) {
+        const pextest::CommandOutcome outcome = RunPex(machine, c.args);
+        EXPECT_EQ(outcome.exit, 1) << c.args;
+        EXPECT_NE(outcome.out.find(std::string("syntax error\n")), std::string::npos) << outcome.out;
+        EXPECT_NE(outcome.out.find(std::string(c.mark) + "not valid: the text does not parse\n"), std::string::npos)
+            << outcome.out;
+    }
+    // A text that parses carries no mark, even after one that did not.
+    EXPECT_EQ(RunPex(machine, "script 'FORCED = TRUE'").out, "item 1: SET(FORCED, TRUE)\nvalid\n");
+}
+
+// The exit status says whether something needs attention; a product that is not registered
+// cannot be reported.
+TEST(UpdateCommands, StatusExitsWithWhetherSomethingIsPendingOrFailed) {
+    pextest::TestMachine machine;
+    pextest::CommandOutcome none = RunPex(machine, "status");
+    EXPECT_EQ(none.exit, 0) << none.out;
+    EXPECT_EQ(none.out.rfind("No product is registered.\nTrace log: ", 0), 0u) << none.out;
+    pextest::SetRegText(reg::kLocalMachine, "Software\\Vantric\\Pex\\Statusprobe", "ContentFileName",
+                        "C:\\Statusprobe\\content.csv");
+    machine.WriteFile("C:\\Statusprobe\\content.csv", "FileName,UpgradeStatus,HomeDir\r\na.dll,ApplicationFailed,C:\\App\r\n");
+    pextest::CommandOutcome failed = RunPex(machine, "status Statusprobe");
+    EXPECT_EQ(failed.exit, 1);
+    EXPECT_NE(failed.out.find("  not applied: row 0 a.dll in C:\\App: ApplicationFailed\n"), std::string::npos) << failed.out;
+    EXPECT_EQ(RunPex(machine, "status --json").exit, 1);
+    machine.WriteFile("C:\\Statusprobe\\content.csv", "FileName,UpgradeStatus\r\na.dll,AppliedSuccessfully\r\n");
+    EXPECT_EQ(RunPex(machine, "status").exit, 0);
+    pextest::CommandOutcome unknown = RunPex(machine, "status Nobody --json");
+    EXPECT_EQ(unknown.exit, 2);
+    EXPECT_NE(unknown.out.find("\"error\": \"no product 'Nobody' is registered"), std::string::npos) << unknown.out;
+}
+
 TEST(UpdateCommands, AllAndProductRunTheLibraryAndExplainWhereTheLogIs) {
     pextest::TestMachine machine;
     pextest::SetRegText(reg::kLocalMachine, "Software\\Vantric\\Pex\\Orlandel", "ContentFileName",
