@@ -11,9 +11,10 @@ namespace pextest {
 
 namespace {
 
-[[noreturn]] void RunAndLeave(int crashAt, int reportFd) {
+[[noreturn]] void RunAndLeave(int crashAt, const Interruption& how, int reportFd) {
     plat::fault::Clear();
-    if (crashAt > 0) plat::fault::CrashAtMutation(crashAt);
+    if (crashAt > 0 && how.powerCut) plat::fault::PowerCutAtMutation(crashAt, how.keepSeed);
+    else if (crashAt > 0) plat::fault::CrashAtMutation(crashAt);
     g_TraceLog.enabled = false;
     UpdateAll(nullptr);
     const int mutations = plat::fault::MutationCount();
@@ -24,7 +25,7 @@ namespace {
 
 }  // namespace
 
-ChildRun RunUpdateInChild(int crashAt) {
+ChildRun RunUpdateInChild(int crashAt, const Interruption& how) {
     ChildRun run;
     int fds[2];
     if (pipe(fds) != 0) {
@@ -34,7 +35,7 @@ ChildRun RunUpdateInChild(int crashAt) {
     const pid_t child = fork();
     if (child == 0) {
         close(fds[0]);
-        RunAndLeave(crashAt, fds[1]);
+        RunAndLeave(crashAt, how, fds[1]);
     }
     close(fds[1]);
     int mutations = 0;
