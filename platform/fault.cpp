@@ -59,9 +59,9 @@ void PowerCutAtMutation(int n, unsigned keepSeed) {
     Plan& plan = ThePlan();
     std::lock_guard<std::mutex> hold(plan.lock);
     plan.crashAt = n;
+    if (!plan.powerCut) power::Start();
     plan.powerCut = true;
     plan.keepSeed = keepSeed;
-    power::Start();
 }
 
 void Clear() {
@@ -70,6 +70,7 @@ void Clear() {
     plan.rules.clear();
     plan.mutations = 0;
     plan.crashAt = 0;
+    if (plan.powerCut) power::Stop();
     plan.powerCut = false;
     for (int& count : plan.operations) count = 0;
 }

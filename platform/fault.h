@@ -23,7 +23,7 @@ constexpr int kCrashExitCode = 86;
 // is replaced by what would survive a power cut (platform/power_cut.h says what was made
 // durable). keepSeed 0 keeps nothing that was not made durable; another seed keeps a random
 // subset of those changes, the same subset for the same seed. Everything on drive C counts as
-// durable when the rule is set.
+// durable when the first such rule since the last Clear is set; a later one only moves the cut.
 void PowerCutAtMutation(int n, unsigned keepSeed = 0);
 
 // Removes every rule and resets the counters.

@@ -19,6 +19,9 @@ namespace plat::power {
 // Starts keeping the durable state: everything on drive C counts as durable now.
 void Start();
 
+// Stops keeping it.
+void Stop();
+
 // Replaces drive C by what survives the cut. seed 0 keeps nothing that was not made durable;
 // any other seed keeps a random subset of the changes that were not (each folder's names
 // together, as a folder's block reaches the disk whole or not at all, and each file's bytes),

@@ -23,6 +23,11 @@ if(NOT WIN32)
     LIBS mendler_core rivzip_codec ZLIB::ZLIB)
   add_dependencies(power_cut_test Rivzip pextestprog)
 
+  pex_add_test(power_cut_rules_test
+    SOURCES ${CMAKE_CURRENT_SOURCE_DIR}/crash/power_cut_rules_test.cpp
+            ${CMAKE_CURRENT_SOURCE_DIR}/crash/child_run.cpp
+    LIBS mendler_core)
+
   pex_add_test(crash_error_injection_test
     SOURCES ${CMAKE_CURRENT_SOURCE_DIR}/crash/error_injection_test.cpp ${PEX_CRASH_SUPPORT}
     LIBS mendler_core rivzip_codec ZLIB::ZLIB)

@@ -176,6 +176,12 @@ void Start() {
     state.active = true;
 }
 
+void Stop() {
+    State& state = TheState();
+    std::lock_guard<std::mutex> hold(state.lock);
+    Forget(state);
+}
+
 void Cut(unsigned seed) {
     State& state = TheState();
     std::lock_guard<std::mutex> hold(state.lock);

@@ -5,6 +5,7 @@
 namespace plat::power {
 
 void Start() {}
+void Stop() {}
 void Cut(unsigned) {}
 void FileFlushed(int) {}
 void FolderFlushed(const std::string&) {}

@@ -1,6 +1,7 @@
 // A product run in a child process that may be ended at any mutating operation, as a power cut
 // or a killed process would end it.
 #pragma once
+#include <functional>
 #include <string>
 
 namespace pextest {
@@ -19,6 +20,10 @@ struct Interruption {
     bool powerCut = false;
     unsigned keepSeed = 0;
 };
+
+// Forks; the child does the work and leaves without any clean-up, reporting the mutating
+// operations counted since the fault plan was last cleared. crashed: the fault plan ended it.
+ChildRun RunInChild(const std::function<void()>& work);
 
 // Forks; the child runs UpdateAll on the current machine and leaves without any clean-up.
 // With crashAt > 0 the child ends just before its crashAt-th mutating operation, as how says. The child
