@@ -1,6 +1,7 @@
 #!/usr/bin/env bash
 # Mendler's two set-up commands:
-#   ./run.sh test   install what is missing, build, run every test
+#   ./run.sh test   install what is missing, build, run every test; then the same with ASan and
+#                   UBSan in build-asan/, with every fuzz corpus replayed through its target
 #   ./run.sh demo   install what is missing, build, update the products of the demo machine
 #   ./run.sh fuzz [SECONDS]   build the fuzz targets with clang and run each for SECONDS (not in CI)
 #   ./run.sh bench  build with optimisation into build-bench/, run every benchmark, write
@@ -31,9 +32,34 @@ build() {
   cmake --build "$BUILD" -j"$(nproc)"
 }
 
+# The suite again with AddressSanitizer and UndefinedBehaviorSanitizer, in a build folder of its
+# own; there the fuzz targets are plain programs and ctest replays every corpus through them.
+SANITIZE_BUILD=build-asan
+# Tests too slow under the sanitizers to run there (README, "What ./run.sh test runs").
+SANITIZE_SKIP_LABEL=sanitize_skip
+
+# Prints how long a step took, for the figures in the README.
+timed() {
+  local what=$1 started=$SECONDS
+  shift
+  "$@"
+  echo "$what: $((SECONDS - started))s"
+}
+
+test_sanitized() {
+  [ -f "$SANITIZE_BUILD/CMakeCache.txt" ] ||
+    cmake -S . -B "$SANITIZE_BUILD" -DCMAKE_BUILD_TYPE=Debug -DPEX_SANITIZE=ON >/dev/null
+  cmake --build "$SANITIZE_BUILD" -j"$(nproc)"
+  # Any report fails its test: UBSan would otherwise print and go on.
+  ASAN_OPTIONS=${ASAN_OPTIONS:-detect_leaks=1:abort_on_error=1} \
+  UBSAN_OPTIONS=${UBSAN_OPTIONS:-halt_on_error=1:print_stacktrace=1} \
+    ctest --test-dir "$SANITIZE_BUILD" --output-on-failure -j"$(nproc)" -LE "$SANITIZE_SKIP_LABEL"
+}
+
 cmd_test() {
-  build
-  ctest --test-dir "$BUILD" --output-on-failure -j"$(nproc)"
+  timed "build" build
+  timed "tests" ctest --test-dir "$BUILD" --output-on-failure -j"$(nproc)"
+  timed "build and tests with ASan and UBSan" test_sanitized
 }
 
 cmd_demo() {

@@ -13,6 +13,7 @@
 #include "diag/trace_log.h"
 #include "diag/trace_startup.h"
 #include "expr/execution_plan.h"
+#include "expr/override_parser.h"
 #include "manifest/content_table.h"
 #include "platform/files.h"
 
@@ -45,6 +46,27 @@ void BM_RowScriptParse(benchmark::State& state) {
         ExecutionPlan plan;
         if (!plan.Parse(text)) state.SkipWithError("the script does not parse");
     }
+}
+
+// A script of state.range(0) bytes, at most the bound on a script's length: assignments in a
+// row (shape 0), or one call with ever more arguments (shape 1), the two shapes whose parse
+// once grew with the square of the text. The time must grow with the text.
+std::string LongScript(std::size_t bytes, int shape) {
+    const std::string start = shape == 0 ? "FORCED = AVAR AND TRUE OR FALSE" : "FORCED = AND(TRUE";
+    const std::string more = shape == 0 ? "; FORCED = AVAR AND TRUE OR FALSE" : ", TRUE";
+    std::string text = start;
+    while (text.size() + more.size() + 1 <= bytes) text += more;
+    return shape == 0 ? text : text + ")";
+}
+
+void BM_RowScriptParseLong(benchmark::State& state) {
+    const std::string text = LongScript(static_cast<std::size_t>(state.range(0)), static_cast<int>(state.range(1)));
+    for (auto _ : state) {
+        ExecutionPlan plan;
+        if (!plan.Parse(text)) state.SkipWithError("the script does not parse");
+    }
+    state.SetComplexityN(state.range(0));
+    state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations()) * state.range(0));
 }
 
 void BM_RowScriptValidate(benchmark::State& state) {
@@ -89,6 +111,9 @@ void BM_RowScriptWholeLogged(benchmark::State& state) {
 }  // namespace
 
 BENCHMARK(BM_RowScriptParse)->Arg(0)->Arg(1)->Unit(benchmark::kMicrosecond);
+BENCHMARK(BM_RowScriptParseLong)
+    ->ArgsProduct({benchmark::CreateRange(1 << 10, kMaxScriptLength, 4), {0, 1}})
+    ->Unit(benchmark::kMillisecond);
 BENCHMARK(BM_RowScriptValidate)->Arg(0)->Arg(1)->Unit(benchmark::kMicrosecond);
 BENCHMARK(BM_RowScriptExecute)->Arg(0)->Arg(1)->Unit(benchmark::kMicrosecond);
 BENCHMARK(BM_RowScriptWhole)->Arg(0)->Arg(1)->Unit(benchmark::kMicrosecond);

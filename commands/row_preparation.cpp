@@ -1,6 +1,8 @@
 // Row preparation: runs once over every freshly loaded content table, before the analysis.
 #include "commands/row_preparation.h"
 
+#include <exception>
+
 #include "commands/update_services.h"
 #include "diag/trace_log.h"
 #include "expr/execution_plan.h"
@@ -20,7 +22,7 @@ void LogComments(const ExecutionPlan& plan) {
 }
 
 // Parses, validates and runs one row's script against the row.
-void EvaluateRow(CContentTable& table, std::uint32_t row, const std::string& script) {
+void RunRowPlan(CContentTable& table, std::uint32_t row, const std::string& script) {
     const int fileName = table.ColumnIndex("FileName");
     TRACE(g_TraceLog, "Evaluating Dynamic Fields for file %s: [%s]\n",
           fileName < 0 ? "" : table.Cell(row, static_cast<std::uint32_t>(fileName)).c_str(),
@@ -46,12 +48,28 @@ void EvaluateRow(CContentTable& table, std::uint32_t row, const std::string& scr
     }
 }
 
+// A failure other than the language's own while the row's plan is made or checked (memory
+// ran out) is that row's failure: the next row goes on.
+void EvaluateRow(CContentTable& table, std::uint32_t row, const std::string& script) {
+    try {
+        RunRowPlan(table, row, script);
+    } catch (const std::exception& failure) {
+        TRACE(g_TraceLog, "EvaluateDynamicFields: plan of row %u abandoned: %s\n",
+              static_cast<unsigned>(row), failure.what());
+    }
+}
+
 }  // namespace
 
 std::int32_t LoadContentRows(CContentTable& table, const std::string& path,
                              const std::string& defaultDirectory) {
     const std::int32_t hr = table.LoadFromFile(path, true, ',');
     if (hr < 0) return hr;
+    // Without these the analysis would take every row as a file without a name, or never as
+    // downloaded, and a run would end by discarding rows it never looked at.
+    for (const char* column : {"FileName", "UpgradeStatus"}) {
+        if (table.ColumnIndex(column) < 0) return table.FailLoad(std::string("there is no column ") + column);
+    }
     NormalizeUpgradeStatus(table);
     ResolveHomeDirs(table, defaultDirectory);
     return EvaluateDynamicFields(table);

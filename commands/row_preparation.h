@@ -7,7 +7,8 @@
 #include "manifest/content_table.h"
 
 // Loads the table (header, ',') and prepares its rows; a negative result is the load failure,
-// returned before anything else runs.
+// returned before anything else runs. A table without a "FileName" or an "UpgradeStatus"
+// column fails the load (the table's LoadFailure says which).
 std::int32_t LoadContentRows(CContentTable& table, const std::string& path,
                              const std::string& defaultDirectory);
 // Replaces every row's "HomeDir" by its resolved form.

@@ -26,7 +26,12 @@ bool CDecompressionObjects::Decompress(std::uint32_t type, const std::string& pa
 
 bool CDecompressionObjects::DecompressNone(const std::string& path, ProgressCallback) {
     TRACE(g_TraceLog, "CDecompressionObjects::DecompressNone, file is %s", path.c_str());
-    return true;
+    // Only a download that needs decompression comes here: its interested parties left no
+    // compressed type to expand it by, and its compressed bytes must not be installed.
+    TRACE(g_TraceLog,
+          "CDecompressionObjects::DecompressNone, the file needs decompression but its download type is None, "
+          "so it cannot be expanded");
+    return false;
 }
 
 bool CDecompressionObjects::DecompressRTPatch(const std::string& path, ProgressCallback) {

@@ -24,11 +24,13 @@ class CDecompressionObjects {
 public:
     CDecompressionObjects();  // calls Load
 
-    // True when the file at path is ready to use: expanded in place, or needing no expansion.
-    // False for an unknown code and for every failed expansion; the file at path then still
-    // holds the download as it was (see DecompressLZW).
+    // True when the file at path is expanded in place and ready to use. Only a download that
+    // needs decompression is given here. False for None, an unknown code and every failed
+    // expansion; the file at path then still holds the download as it was (see DecompressLZW).
     bool Decompress(std::uint32_t type, const std::string& path, ProgressCallback callback);
-    // True; the file is left as it is.
+    // False, the file left as it is: a download that needs decompression whose download type
+    // came out as None (its interested parties share no compressed type) has no expansion, and
+    // installing its compressed bytes would break the target.
     bool DecompressNone(const std::string& path, ProgressCallback callback);
     // Expands the SZDD file at path in place through Rivzip.dll, by way of a temporary copy;
     // progress goes to callback. On failure the download is left as it was: a failure before the

@@ -19,6 +19,7 @@ TraceLog::TraceLog(const std::string& fileName) {
 
 void TraceLog::SetFileName(const std::string& fileName) {
     fileName_ = fileName;
+    openFailed_ = false;
     if (!fileName_.empty()) fileOutput = true;
 }
 
@@ -31,8 +32,16 @@ bool TraceLog::SetSubstitution(const std::string& search, const std::string& rep
 
 bool TraceLog::Open() {
     isOpen_ = !fileName_.empty() && file_.Open(fileName_);
-    if (!isOpen_) fileOutput = false;
+    if (!isOpen_) {
+        openFailed_ = openFailed_ || fileOutput;
+        fileOutput = false;
+    }
     return isOpen_;
+}
+
+void TraceLog::ResumeFileOutput() {
+    if (openFailed_ && !fileName_.empty()) fileOutput = true;
+    openFailed_ = false;
 }
 
 void TraceLog::Close() {
@@ -50,8 +59,7 @@ void TraceLog::Backup() {
     if (fileName_.empty()) return;
     plat::paths::PathParts parts = plat::paths::SplitPath(fileName_);
     parts.ext = ".bak";
-    plat::files::Copy(fileName_, plat::paths::MakePath(parts), false);
-    Delete();
+    if (plat::files::Copy(fileName_, plat::paths::MakePath(parts), false)) Delete();
 }
 
 namespace {

@@ -41,10 +41,14 @@ public:
     // Opens the file for appending; false (and fileOutput off) when the name is empty or the
     // file cannot be opened.
     bool Open();
+    // Switches fileOutput on again when a failed open switched it off: such a loss lasts for
+    // the rest of one run only, and each run of the library tries the file again.
+    void ResumeFileOutput();
     void Close();   // closes the file if open
     void Delete();  // Close, then delete the file
     // Close, copy the file to the same name with the extension ".bak" (replacing an older
-    // backup), then delete the file whether or not the copy succeeded.
+    // backup), then delete the file once the copy succeeded. When the copy fails the file stays,
+    // and the new lines follow the previous run's: the previous log is never lost.
     void Backup();
     // Every occurrence of search in a line becomes replacement; an empty search disables it. A
     // replacement that contains the search text would never finish, so such a pair is refused
@@ -71,6 +75,7 @@ private:
     std::string fileName_;
     TraceFile file_;
     bool isOpen_ = false;
+    bool openFailed_ = false;  // fileOutput was switched off by a failed open
     std::string search_, replacement_;
 };
 

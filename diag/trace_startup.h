@@ -14,5 +14,6 @@ extern const char* const kTraceHiddenWordToken;
 // then fails and file output goes off). Without a module path (empty, or 1024 characters or
 // more, which the module-name buffer cannot hold) the file is "c:\log.log". Then: substitution
 // pair set; keepOpen off; file closed; fileOutput on for the chosen file; Backup, so the
-// previous log becomes the ".bak" beside it and the new log starts with the first line traced.
+// previous log becomes the ".bak" beside it and the new log starts with the first line traced
+// (a log that cannot be copied to its ".bak" stays, and the new lines follow it).
 void ConfigureTraceLog(TraceLog& log, const std::string& modulePath);

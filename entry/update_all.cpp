@@ -4,6 +4,7 @@
 #include <cstring>
 
 #include "diag/trace_log.h"
+#include "entry/run_guard.h"
 #include "manifest/manifest_parser.h"
 #include "platform/cfile.h"
 #include "platform/registry.h"
@@ -12,18 +13,20 @@ namespace reg = plat::reg;
 
 namespace {
 
-void ProcessProduct(const char* name, ProgressCallback callback) {
+void ProcessProduct(UpdateAllRun& run, const char* name, ProgressCallback callback) {
     CManifestParser parser;
     parser.ClearSpecialFileList();
     parser.AddToSpecialList("mendler.DLL");
     parser.AddToSpecialList("fetchwell.DLL");
     parser.AddToSpecialList("pellow.exe");
     parser.AddToSpecialList("zendor32.exe");
-    parser.ProcessUpdateInformation(_bstr_t(name), callback);
+    const _bstr_t project(name);
+    run.HandOverToProduct();
+    parser.ProcessUpdateInformation(project, callback);
     if (parser.WasSpecialFileUpdateAttempted()) ResetUpdateScheduleDates();
 }
 
-void LoopOverProducts(reg::HKey products, ProgressCallback callback) {
+void LoopOverProducts(UpdateAllRun& run, reg::HKey products, ProgressCallback callback) {
     TRACE(g_TraceLog, "UpdateAll, main key is open");
     std::uint32_t subKeys = 0;
     if (callback && reg::QueryInfoKey(products, &subKeys, nullptr) == 0) {
@@ -44,17 +47,19 @@ void LoopOverProducts(reg::HKey products, ProgressCallback callback) {
             callback(&g_ProgressData);
         }
         TRACE(g_TraceLog, "UpdateAll, key %d is '%s'", static_cast<int>(index + 1), name);
-        ProcessProduct(name, callback);
+        ProcessProduct(run, name, callback);
     }
 }
 
 }  // namespace
 
 extern "C" bool UpdateAll(ProgressCallback callback) {
+    UpdateAllRun run;
+    if (!run.Entered()) return false;  // a nested call: the run in progress goes on untouched
     try {
         reg::Key products;
         if (reg::OpenKey(reg::kLocalMachine, "software\\vantric\\Pex", reg::kKeyRead, products.out()) == 0)
-            LoopOverProducts(products.get(), callback);
+            LoopOverProducts(run, products.get(), callback);
     } catch (const plat::CFileException& e) {
         // A product run that throws (a content file that cannot be written) ends the loop; the
         // remaining products wait for the next run. The trace says why the run stopped where

@@ -1,5 +1,7 @@
 #include "expr/execution_plan.h"
 
+#include <exception>
+
 #include "commands/update_services.h"
 #include "diag/trace_log.h"
 #include "expr/evaluation.h"
@@ -29,14 +31,17 @@ ExecutionPlan::~ExecutionPlan() {
 bool ExecutionPlan::Parse(const std::string& text) {
     TRACE(g_TraceLog, "Parsing: %s\n", text.c_str());
     g_currentPlan = this;
-    return ParseOverrideText(text) == 0;
+    const int result = ParseOverrideText(text);
+    // The bounds on a script are this system's own: the support log says which was exceeded.
+    const std::string refusal = ParseRefusalMessage(result);
+    if (!refusal.empty()) TRACE(g_TraceLog, "ExecutionPlan: Parse, %s\n", refusal.c_str());
+    return result == kParseAccepted;
 }
 
-void ExecutionPlan::Push(const COverrideExpression& node) {
-    COverrideExpression item = node;
+void ExecutionPlan::Push(COverrideExpression node) {
     TRACE(g_TraceLog, "pushing # %d, %s\n", static_cast<int>(items_.size() + 1),
-          item.DisplayText().c_str());
-    items_.push_back(item);
+          node.DisplayText().c_str());
+    items_.push_back(std::move(node));
 }
 
 bool ExecutionPlan::Validate() {
@@ -66,6 +71,13 @@ std::int32_t ExecutionPlan::Execute(UpdateServices& services) {
             TRACE(g_TraceLog, "Plan Execution threw exception");
             code = failure.code;
             comments_.push_back(failure.DisplayText());
+        } catch (const std::exception& failure) {
+            // Not the language's own failure (memory ran out, a file operation failed): the
+            // item fails like one, and the row's other items and the other rows go on.
+            TRACE(g_TraceLog, "ExecutionPlan: Execute, item # %d failed: %s\n", static_cast<int>(i),
+                  failure.what());
+            code = COverrideExpression::kUnexpected;
+            comments_.push_back(COverrideExpression::Failure(code, failure.what()).DisplayText());
         }
         TRACE(g_TraceLog, "-- Done.\n");
     }

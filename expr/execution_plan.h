@@ -23,7 +23,7 @@ public:
     // used (assignments before the error stay in it). Parsing twice appends.
     bool Parse(const std::string& text);
     // Appends an assignment; called by the grammar through CurrentPlan().
-    void Push(const COverrideExpression& node);
+    void Push(COverrideExpression node);
     // Checks the items in order until the first invalid one. False with one comment per
     // problem; the caller prints the comments.
     bool Validate();

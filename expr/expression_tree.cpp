@@ -4,33 +4,36 @@
 #include "expr/command_table.h"
 #include "expr/execution_plan.h"
 
-COverrideExpression AddParameter(COverrideExpression& node, const COverrideExpression& parameter) {
-    node.params.push_back(parameter);
+COverrideExpression& AddParameter(COverrideExpression& node, COverrideExpression&& parameter) {
+    node.params.push_back(std::move(parameter));
     return node;
 }
 
-COverrideExpression AttachParameters(COverrideExpression& call, COverrideExpression& paramList) {
-    call.params = paramList.params;
+COverrideExpression AttachParameters(COverrideExpression&& call, COverrideExpression&& paramList) {
+    // The list's DisplayText is taken before its items move into the call.
+    const std::string listText = paramList.DisplayText();
+    call.params = std::move(paramList.params);
     TRACE(g_TraceLog, "Evaluate Function [%s]. Params are %d:%s\n", call.DisplayText().c_str(),
-          static_cast<int>(call.params.size()), paramList.DisplayText().c_str());
+          static_cast<int>(call.params.size()), listText.c_str());
     for (COverrideExpression& parameter : call.params) {
         TRACE(g_TraceLog, "[%s]\n", parameter.DisplayText().c_str());
     }
     TRACE(g_TraceLog, "Function Result: (%s)\n", ("Result:" + call.DisplayText()).c_str());
+    return std::move(call);
+}
+
+COverrideExpression MakeCall(const std::string& name, COverrideExpression&& operand) {
+    COverrideExpression call = COverrideExpression::FromText(COverrideExpression::kFunc, name);
+    call.params.push_back(std::move(operand));
     return call;
 }
 
-COverrideExpression MakeCall(const std::string& name, const COverrideExpression& operand) {
+COverrideExpression MakeCall(const std::string& name, COverrideExpression&& left,
+                             COverrideExpression&& right) {
     COverrideExpression call = COverrideExpression::FromText(COverrideExpression::kFunc, name);
-    call.params.push_back(operand);
-    return call;
-}
-
-COverrideExpression MakeCall(const std::string& name, const COverrideExpression& left,
-                             const COverrideExpression& right) {
-    COverrideExpression call = COverrideExpression::FromText(COverrideExpression::kFunc, name);
-    call.params.push_back(left);
-    call.params.push_back(right);
+    call.params.reserve(2);
+    call.params.push_back(std::move(left));
+    call.params.push_back(std::move(right));
     return call;
 }
 
@@ -45,11 +48,9 @@ COverrideExpression CreateVariable(const std::string& text) {
     return variable;
 }
 
-COverrideExpression MakeAssignment(const COverrideExpression& setting, COverrideExpression& value) {
+void MakeAssignment(const COverrideExpression& setting, COverrideExpression&& value) {
     COverrideExpression variable = CreateVariable(setting.stringValue);
     TRACE(g_TraceLog, "Assigning Setting:%s=%s\n", variable.DisplayText().c_str(),
           value.DisplayText().c_str());
-    COverrideExpression assignment = MakeCall("SET", variable, value);
-    CurrentPlan().Push(assignment);
-    return assignment;
+    CurrentPlan().Push(MakeCall("SET", std::move(variable), std::move(value)));
 }

@@ -12,7 +12,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     const std::string file(reinterpret_cast<const char*>(data), size);
     plat::elf::LooksLikeElf(file);
     std::string block;
-    if (!plat::elf::SectionContents(file, plat::ver::kElfSection, &block)) return 0;
+    if (!plat::elf::SectionContents(file, plat::ver::kElfSection, plat::ver::kMaxBlockSize, &block)) return 0;
     if (block.size() > file.size()) std::abort();
     plat::ver::VersionInfo info;
     info.Parse(block);

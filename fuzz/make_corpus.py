@@ -36,6 +36,8 @@ write("content_table", "prepared", b"\x08" + CONTENT.encode() +
 write("content_table", "lf_and_empty_line", b"\x10" + b"A,B,\na, b ,\n\nafter,the,end\n")
 write("content_table", "no_header_semicolon", b"\x03" + b"x;\"y\";z\rp;q\r")
 write("content_table", "too_long_row", b"\x00" + b"A,B\r\n1,2,3\r\n")
+# A script assigning a column the file lacks: nothing is stored, the plan still succeeds.
+write("content_table", "missing_column", b"\x08" + b"FileName,DynamicFieldInfo\r\na.dll,FORCED = TRUE\r\n")
 
 # --- dynamic-field texts: first byte picks the row's cells ---
 SCRIPTS = {
@@ -49,6 +51,28 @@ SCRIPTS = {
 }
 for i, (name, text) in enumerate(sorted(SCRIPTS.items())):
     write("execution_plan", name, bytes([i * 37 & 0xFF]) + text.encode())
+
+
+# Hostile texts, each once a fault: chains and wide calls that parsed in quadratic time, trees
+# deep enough to overflow a 1 MiB stack (refused past 256 levels), a text past the 64 KiB
+# bound, files that FileVersionAtLeast read whole (a device, standard input), and tokens that
+# end the text at the scanner's length limit.
+def chain(n, operand="TRUE", op=" AND "):
+    return "FORCED = " + op.join([operand] * (n + 1))
+
+
+HOSTILE = {
+    "and_chain": chain(1000),
+    "deep_chain": chain(300, "a", "&"),
+    "wide_and": "FORCED = AND(" + ", ".join(["TRUE"] * 3000) + ")",
+    "too_long": chain(7300),
+    "device_version": "FORCED = FileVersionAtLeast(\"Z:\\\\dev\\\\zero\", \"1.0.0.0\"); "
+                      "FORCED = FileVersionAtLeast(\"Z:\\\\dev\\\\stdin\", \"0.0.0.0\")",
+    "long_string_at_end": "FORCED = \"" + "s" * 8190 + "\"",
+    "long_name_at_end": "FORCED = N" + "n" * 8190,
+}
+for name, text in sorted(HOSTILE.items()):
+    write("execution_plan", name, b"\x00" + text.encode())
 
 # --- SZDD: first byte bit 0 = round trip, bits 1-7 = read size ---
 for name in ("hello.txt_", "blanks.txt_"):
@@ -129,12 +153,37 @@ def elf(block, bits=64):
 
 write("elf_section", "elf64", elf(BLOCK, 64))
 write("elf_section", "elf32", elf(BLOCK, 32))
+# A section that claims more bytes than any file holds: it is not read.
+HUGE = elf(BLOCK, 64)
+write("elf_section", "huge_section", HUGE[:-24] + struct.pack("<Q", 0xFFFFFFFFFFFF) + HUGE[-16:])
 
 # --- PE: the real Windows module of the tests, and a copy cut short ---
 with open(os.path.join(FIXTURES, "versioned.dll"), "rb") as f:
     DLL = f.read()
 write("pe_resources", "versioned_dll", DLL)
 write("pe_resources", "headers_only", DLL[:1024])
+
+
+def resource_data_entry(dll):
+    """The file offset of the data entry of the first resource of the first type."""
+    pe = struct.unpack_from("<I", dll, 60)[0]
+    count, opt_size = struct.unpack_from("<H", dll, pe + 6)[0], struct.unpack_from("<H", dll, pe + 20)[0]
+    opt = pe + 24
+    dirs = opt + (96 if struct.unpack_from("<H", dll, opt)[0] == 0x10B else 112)
+    rva = struct.unpack_from("<I", dll, dirs + 16)[0]
+    for i in range(count):
+        vsize, vaddr, _, raw = struct.unpack_from("<IIII", dll, opt + opt_size + i * 40 + 8)
+        if vaddr <= rva < vaddr + max(vsize, _):
+            root = raw + rva - vaddr
+    off = 0
+    for _level in range(3):
+        off = struct.unpack_from("<I", dll, root + (off & 0x7FFFFFFF) + 16 + 4)[0]
+    return root + off
+
+
+# A version resource whose size claims gigabytes: it is not read.
+ENTRY = resource_data_entry(DLL)
+write("pe_resources", "huge_resource", DLL[:ENTRY + 4] + struct.pack("<I", 0xFFFFFF00) + DLL[ENTRY + 8:])
 
 # --- .reg files ---
 REG = ("Windows Registry Editor Version 5.00\r\n\r\n"

@@ -35,6 +35,14 @@ cmake --build "$BUILD" -j"$(nproc)" --target pex_fuzzers
 
 if (($#)); then TARGETS=("$@"); else mapfile -t TARGETS <"$BUILD/fuzz/targets.txt"; fi
 
+# The targets whose input is a whole content file or a row's script get inputs up to 1 MiB, the
+# sizes at which a long script or a big cell once exhausted the stack or grew without bound; the
+# others keep libFuzzer's default, sized from their seeds.
+LARGE_INPUTS=" content_table execution_plan "
+MAX_LEN=1048576
+# Every target runs under a 1 MiB stack, the main thread's stack on Windows.
+STACK_KB=1024
+
 # Leaks are reported as findings; a stuck input counts after 10 s.
 export ASAN_OPTIONS=${ASAN_OPTIONS:-detect_leaks=1:abort_on_error=1}
 export UBSAN_OPTIONS=${UBSAN_OPTIONS:-halt_on_error=1:print_stacktrace=1}
@@ -45,7 +53,11 @@ run_one() {
   local extra=()
   # A dictionary of the input's words, where the format has them.
   [ -f "fuzz/dict/$t.dict" ] && extra+=(-dict="fuzz/dict/$t.dict")
+  [[ "$LARGE_INPUTS" == *" $t "* ]] && extra+=(-max_len="$MAX_LEN")
+  # This function runs in a subshell of its own, so the limit holds for this target only.
+  ulimit -s "$STACK_KB"
   # The parsers print their messages on standard output; -close_fd_mask=1 keeps the log readable.
+  # -rss_limit_mb also bounds a single allocation (-malloc_limit_mb defaults to it).
   if "$BUILD/fuzz/${t}_fuzz" "$corpus" "fuzz/corpus/$t" -max_total_time="$SECONDS_EACH" \
       -timeout=10 -rss_limit_mb=2048 -close_fd_mask=1 -print_final_stats=1 "${extra[@]}" \
       -artifact_prefix="$artifacts/" >"$log" 2>&1; then

@@ -85,7 +85,10 @@ bool CManifestParser::DiscardContentFile() {
     // on the way then leaves that entry naming a file that the next run loads, or fails to load,
     // and discards again; never a file or entries that nothing names and nothing would remove.
     const bool removed = plat::files::Remove(contentFilePath_) || !plat::files::Exists(contentFilePath_);
-    if (!removed) return false;
+    return removed && RemoveContentFileEntries();
+}
+
+bool CManifestParser::RemoveContentFileEntries() {
     const bool mode = RemoveEntry(profile_, projectSection_, "ContentFileMode");
     const bool target = RemoveEntry(profile_, projectSection_, "ContentFileTarget");
     return mode && target && RemoveEntry(profile_, projectSection_, "ContentFileName");

@@ -22,17 +22,30 @@ bool IsWhite(char c) {
     return c == ' ' || c == '\t' || c == '\r' || c == '\n' || c == '\v' || c == '\f';
 }
 
+Span Trim(Span text) {
+    while (text.begin < text.end && IsWhite(*text.begin)) ++text.begin;
+    while (text.end > text.begin && IsWhite(text.end[-1])) --text.end;
+    return text;
+}
+
+bool Quoted(Span text) { return text.size() >= 2 && *text.begin == '"' && text.end[-1] == '"'; }
+
 // The cell's value: short cells are kept as they are, so that a lone blank survives; longer
 // ones lose surrounding white space and then one pair of enclosing double quotes. A cell
 // with inner text is kept exactly, blanks included.
 Span Unquote(Span cell) {
     if (cell.size() < 2) return cell;
-    Span t = cell;
-    while (t.begin < t.end && IsWhite(*t.begin)) ++t.begin;
-    while (t.end > t.begin && IsWhite(t.end[-1])) --t.end;
+    const Span t = Trim(cell);
     if (t.begin == t.end) return t;
-    if (t.size() >= 2 && *t.begin == '"' && t.end[-1] == '"') return Span{t.begin + 1, t.end - 1};
+    if (Quoted(t)) return Span{t.begin + 1, t.end - 1};
     return cell;
+}
+
+// A column name: unquoted like a cell, but always trimmed, since a blank after a comma in a
+// header written by hand would otherwise make the name unusable.
+Span HeaderName(Span name) {
+    const Span t = Trim(name);
+    return Quoted(t) ? Span{t.begin + 1, t.end - 1} : t;
 }
 
 // Scans one line starting at pos in a single pass, handing each cell to onCell (which may
@@ -91,37 +104,62 @@ std::int32_t HResultFromWin32(std::uint32_t code) {
 
 std::int32_t CContentTable::LoadFromFile(const std::string& path, bool header, char separator) {
     Clear();
+    loadFailure_.clear();
     std::string bytes;
-    if (!plat::files::ReadAll(path, &bytes)) return HResultFromWin32(plat::LastError());
+    if (!plat::files::ReadAll(path, &bytes, kMaxFileBytes)) {
+        const std::uint32_t error = plat::LastError();
+        FailLoad(error == plat::kErrorFileTooLarge
+                     ? "the file is larger than " + std::to_string(kMaxFileBytes) + " bytes"
+                     : "cannot read the file (error " + std::to_string(error) + ")");
+        return HResultFromWin32(error);
+    }
     return LoadFromText(bytes, header, separator);
 }
 
 std::int32_t CContentTable::LoadFromText(const std::string& bytes, bool header, char separator) {
     Clear();
-    if (!header) {
-        // The first row defines the column count; its cells are read like any other row's.
-        bool empty = false;
-        ScanLine(bytes, 0, separator, &empty, [this](Span) { ++columnCount_; return true; });
-        if (columnCount_ == 0) return kFail;
-        columns_.assign(columnCount_, std::string());
-        return ParseRows(bytes, 0, separator);
-    }
-    bool empty = false;
-    const std::size_t next = ScanLine(bytes, 0, separator, &empty, [this](Span name) {
-        columns_.emplace_back(name.begin, name.size());
-        return true;
-    });
-    columnCount_ = static_cast<std::uint32_t>(columns_.size());
-    if (columnCount_ == 0) return kFail;
-    return ParseRows(bytes, next, separator);
+    loadFailure_.clear();
+    std::size_t pos = bytes.compare(0, 3, "\xEF\xBB\xBF") == 0 ? 3 : 0;
+    const std::int32_t hr = ParseHeader(bytes, &pos, header, separator);
+    return hr < 0 ? hr : ParseRows(bytes, pos, header ? 2 : 1, separator);
 }
 
-// The rows from pos on. The table ends at the first empty line, whatever ends it: a file whose
-// line ends were converted to LF or CR alone then holds the same rows as its CR LF original,
-// and the line after the empty one is never read at all.
-std::int32_t CContentTable::ParseRows(const std::string& bytes, std::size_t pos, char separator) {
-    cells_.reserve(EstimateLines(bytes) * columnCount_);
-    while (pos < bytes.size()) {
+std::int32_t CContentTable::FailLoad(const std::string& reason) {
+    Clear();
+    loadFailure_ = reason;
+    return kFail;
+}
+
+// The column names from the first line, or without header only their number (the line is then
+// read again as the first row). *pos moves past the header line.
+std::int32_t CContentTable::ParseHeader(const std::string& bytes, std::size_t* pos, bool header,
+                                        char separator) {
+    bool empty = false;
+    const std::size_t next = ScanLine(bytes, *pos, separator, &empty, [this, header](Span name) {
+        if (columns_.size() == kMaxColumns) return false;
+        const Span text = header ? HeaderName(name) : Span{name.end, name.end};
+        columns_.emplace_back(text.begin, text.size());
+        return true;
+    });
+    if (next == std::string::npos) {
+        return FailLoad("line 1 has more than " + std::to_string(kMaxColumns) + " columns");
+    }
+    columnCount_ = static_cast<std::uint32_t>(columns_.size());
+    if (columnCount_ == 0) return FailLoad("line 1 is empty, there is no header");
+    if (header) *pos = next;
+    return kOk;
+}
+
+// The rows from pos on, the first of them on line firstLine. An empty line ends the table when
+// it ends in CR LF, the line end the system writes, and is passed over when it ends in LF or CR
+// alone; either way the next line is read from its first character or not at all.
+std::int32_t CContentTable::ParseRows(const std::string& bytes, std::size_t pos, std::uint32_t firstLine,
+                                      char separator) {
+    const std::uint64_t estimate = static_cast<std::uint64_t>(EstimateLines(bytes)) * columnCount_;
+    cells_.reserve(static_cast<std::size_t>(std::min(estimate, kMaxCells)));
+    std::uint64_t rows = 0;
+    for (std::uint32_t line = firstLine; pos < bytes.size(); ++line) {
+        const std::size_t start = pos;
         std::uint32_t inRow = 0;
         bool empty = false;
         pos = ScanLine(bytes, pos, separator, &empty, [this, &inRow](Span cell) {
@@ -132,10 +170,16 @@ std::int32_t CContentTable::ParseRows(const std::string& bytes, std::size_t pos,
             return true;
         });
         if (pos == std::string::npos) {
-            Clear();
-            return kFail;
+            return FailLoad("line " + std::to_string(line) + " has more cells than the " +
+                            std::to_string(columnCount_) + " columns of the header");
         }
-        if (empty) break;
+        if (empty && pos - start == 2) break;  // CR LF
+        if (empty) continue;
+        // Checked before the row is filled up: the cells are what a short row costs.
+        if (++rows * columnCount_ > kMaxCells) {
+            return FailLoad("line " + std::to_string(line) + " takes the table past " +
+                            std::to_string(kMaxCells) + " cells");
+        }
         cells_.resize(cells_.size() + (columnCount_ - inRow));
     }
     keyColumn = 0;

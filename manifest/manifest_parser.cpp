@@ -26,3 +26,14 @@ void CManifestParser::TestSpecialFile(const std::string& fileName) {
     // cleared, so a special file followed by ordinary rows still resets the host's schedule.
     if (specialFiles_.count(NormaliseName(fileName)) != 0) specialFileAttempted_ = true;
 }
+
+void CManifestParser::ResetRunState() {
+    masterList_ = CMasterList();
+    workSteps_ = 0;
+    table_.Clear();
+    cursor_ = -1;
+    contentFilePath_.clear();
+    mandatoryOnly_ = false;
+    contentFileTarget_.clear();
+    specialFileAttempted_ = false;
+}

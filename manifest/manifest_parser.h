@@ -82,6 +82,17 @@ public:
 private:
     // Records whether the normalised name is in the special-file list.
     void TestSpecialFile(const std::string& fileName);
+    // Forgets what an earlier product run of this parser left: master list, work step count,
+    // content table and file, and the special-file-attempted flag. The special-file list stays
+    // (the host fills it before the run), and so do the settings read from the last project's
+    // section (Init reads DefaultPath from there).
+    void ResetRunState();
+    // Handles a content file that LoadManifest could not load (content_rejection.cpp);
+    // returns the failures to count for it.
+    std::int32_t RejectContentFile();
+    // Removes the product's three content file entries, "ContentFileName" last; true when all
+    // three are gone.
+    bool RemoveContentFileEntries();
     // Pipeline steps.
     void DecompressFiles(std::int32_t& result, ProgressCallback callback);
     void ApplyGroups(std::int32_t& result, ProgressCallback callback);

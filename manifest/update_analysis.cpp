@@ -2,6 +2,7 @@
 #include <cstdlib>
 
 #include "diag/trace_log.h"
+#include "entry/run_guard.h"
 #include "manifest/manifest_parser.h"
 #include "model/upgrade_status.h"
 
@@ -12,6 +13,8 @@ bool NonZero(const std::string& cell) { return std::atol(cell.c_str()) != 0; }
 }  // namespace
 
 std::int32_t CManifestParser::ProcessUpdateInformation(_bstr_t project, ProgressCallback callback) {
+    const ProductRun run;  // one run at a time in the process, one product run on the machine
+    if (!run.Entered()) return ProductRun::kRefusedResult;
     TRACE(g_TraceLog, "CManifestParser: ProcessUpdateInformation");
     if (callback) {
         g_ProgressData.SetStatusText("Analyzing data...");
@@ -20,10 +23,11 @@ std::int32_t CManifestParser::ProcessUpdateInformation(_bstr_t project, Progress
     std::int32_t result = 0;
     bool present = false;
     const std::string name = std::string(project);
+    ResetRunState();
     const bool loaded = LoadManifest(name, &present);
     if (present) result = static_cast<std::int32_t>(RecoverEarlierRun(loaded ? &table_ : nullptr));
     if (!loaded) {
-        DiscardContentFile();
+        result += RejectContentFile();
         TRACE(g_TraceLog, "CManifestParser: ProcessUpdateInformation, Unable to load Content file");
     } else if (!present) {
         TRACE(g_TraceLog, "CManifestParser: ProcessUpdateInformation, No content file exists, nothing to do");

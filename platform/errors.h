@@ -23,6 +23,7 @@ enum WinError : std::uint32_t {
     kErrorDirNotEmpty = 145,
     kErrorAlreadyExists = 183,
     kErrorFilenameExcedRange = 206,
+    kErrorFileTooLarge = 223,
     kErrorMoreData = 234,
     kErrorWaitTimeout = 258,
     kErrorNoMoreItems = 259,

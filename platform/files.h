@@ -85,7 +85,9 @@ std::vector<FindEntry> Find(const std::string& pattern);
 std::string ModuleFileName(const void* addressInModule);
 
 // Whole-file helpers for the system's own files (content file, logs).
-bool ReadAll(const std::string& path, std::string* bytes);
+// A file of more than maxBytes is refused with 223 (ERROR_FILE_TOO_LARGE), judged by its size
+// before anything is read and again while reading, in case it grows meanwhile.
+bool ReadAll(const std::string& path, std::string* bytes, std::uint64_t maxBytes = UINT64_MAX);
 // Writes durably: the new bytes are flushed to the disk before they take the file's name, in one
 // step, so the file holds its old or its new content at every moment, also after a power cut.
 // On failure the old file stays as it was. (The emulation keeps the previous version hidden

@@ -1,6 +1,6 @@
-# The application framework's pieces: file class, synchronisation and time, date parser, COM
-# string, application object; and the digests of files, which read through the file class.
-# Portable code sits in platform/, the rest in the backend folder.
+# The application framework's pieces: file class, synchronisation (the machine lock too) and
+# time, date parser, COM string, application object; and the digests of files, which read through
+# the file class. Portable code sits in platform/, the rest in the backend folder.
 if(WIN32)
   set(PEX_FRAMEWORK_BACKEND win32)
 else()
@@ -13,7 +13,9 @@ add_library(pex_framework STATIC
   ${CMAKE_CURRENT_SOURCE_DIR}/bstr.cpp
   ${CMAKE_CURRENT_SOURCE_DIR}/app.cpp
   ${CMAKE_CURRENT_SOURCE_DIR}/${PEX_FRAMEWORK_BACKEND}/cfile.cpp
+  ${CMAKE_CURRENT_SOURCE_DIR}/machine_lock_wait.cpp
   ${CMAKE_CURRENT_SOURCE_DIR}/${PEX_FRAMEWORK_BACKEND}/sync.cpp
+  ${CMAKE_CURRENT_SOURCE_DIR}/${PEX_FRAMEWORK_BACKEND}/machine_lock.cpp
   ${CMAKE_CURRENT_SOURCE_DIR}/digest.cpp
   ${CMAKE_CURRENT_SOURCE_DIR}/${PEX_FRAMEWORK_BACKEND}/sha256.cpp)
 # Paths, errors and the fault plan come from the base; the application profile from the registry.

@@ -63,11 +63,16 @@ private:
 // GetFileVersionInfo: the raw block of the file at a Windows path: the RT_VERSION resource of
 // a PE file, or the ".pexver" section that the build stamps into our ELF modules and programs.
 // False and the last error when there is none: 2/3 for a missing file, 1812 for a file that
-// is no module, 1813 for a module without version information.
+// is no module (a folder, a device or a pipe included), 1813 for a module without version
+// information. Only the headers and the part that holds the block are read.
 bool ReadBlock(const std::string& winPath, std::string* block);
 
 // ReadBlock followed by Parse; a block that does not parse gives 1813.
 bool Read(const std::string& winPath, VersionInfo* info);
+
+// The largest version block read from a file; far more than a block holds, whose length is a
+// 16-bit field.
+constexpr std::uint64_t kMaxBlockSize = 1u << 20;
 
 // The name of the ELF section that carries a module's version block.
 constexpr const char* kElfSection = ".pexver";

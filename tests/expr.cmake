@@ -4,7 +4,8 @@ target_link_libraries(pex_expr_test_support PUBLIC pex_commands pex_expr pex_tes
                       GTest::gtest)
 pex_warnings(pex_expr_test_support)
 
-foreach(unit override_expression override_parser validation builtins execution_plan)
+foreach(unit override_expression override_parser validation builtins execution_plan
+             hostile_scripts)
   if(EXISTS ${CMAKE_CURRENT_SOURCE_DIR}/expr/${unit}_test.cpp)
     pex_add_test(expr_${unit}_test
       SOURCES ${CMAKE_CURRENT_SOURCE_DIR}/expr/${unit}_test.cpp
@@ -21,5 +22,9 @@ endif()
 if(TARGET expr_builtins_test)
   # FileVersionAtLeast reads a real Windows DLL with a version resource.
   target_compile_definitions(expr_builtins_test PRIVATE
+    PEX_FIXTURE_DIR="${CMAKE_CURRENT_SOURCE_DIR}/fixtures")
+endif()
+if(TARGET expr_hostile_scripts_test)
+  target_compile_definitions(expr_hostile_scripts_test PRIVATE
     PEX_FIXTURE_DIR="${CMAKE_CURRENT_SOURCE_DIR}/fixtures")
 endif()

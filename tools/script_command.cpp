@@ -24,6 +24,9 @@ const char kUsage[] =
     "With --row, a valid plan is also executed against row N (counted from 0, as the trace log\n"
     "counts rows) of the content file, and the cells it changed are printed; the file itself is\n"
     "not changed. CONTENTFILE is a Windows path on the machine, or a host path starting with '/'.\n"
+    "An assignment to a column that the content file lacks (FORCED without a \"Force Download\"\n"
+    "column) stores nothing and is printed as \"not stored\"; the plan still succeeds, as in a\n"
+    "real run.\n"
     "Exit status: 0 when the text is valid (and, with --row, ran without failure), 1 otherwise.\n";
 
 struct RowChoice {
@@ -41,6 +44,20 @@ bool ParseRowChoice(const std::string& text, RowChoice* choice) {
     return *end == '\0' && choice->row >= 0 && !choice->file.empty();
 }
 
+// The row's services, which also print each assignment that found no column to store into.
+class ReportingServices : public UpdateServices {
+public:
+    using UpdateServices::UpdateServices;
+    std::int32_t SetSymbol(std::string name, COverrideExpression& value) override {
+        const std::int32_t hr = UpdateServices::SetSymbol(name, value);
+        if (hr < 0) {
+            std::printf("not stored: %s = %s: the content file has no column \"%s\"\n", name.c_str(),
+                        value.ValueText().c_str(), ColumnForSymbol(name).c_str());
+        }
+        return hr;
+    }
+};
+
 // Runs the plan against the row and prints every cell that it changed.
 int RunOnRow(ExecutionPlan& plan, const RowChoice& choice) {
     CContentTable table;
@@ -57,7 +74,7 @@ int RunOnRow(ExecutionPlan& plan, const RowChoice& choice) {
     std::vector<std::string> before;
     for (std::uint32_t c = 0; c < table.ColumnCount(); ++c) before.push_back(table.Cell(row, c));
     RowReference reference{table, row};
-    UpdateServices services(reference);
+    ReportingServices services(reference);
     const std::int32_t hr = plan.Execute(services);
     for (const std::string& comment : plan.Comments()) std::printf("failed: %s\n", comment.c_str());
     for (std::uint32_t c = 0; c < table.ColumnCount(); ++c)

@@ -1,8 +1,8 @@
 // ELF sections by name: the section header table (e_shoff, e_shnum) and the table of section
-// names (e_shstrndx). Every offset is checked against the file, since any file may be asked.
+// names (e_shstrndx). Every offset is checked against the file, since any file may be asked;
+// of the names, only the bytes that could match are read.
 #include "platform/posix/elf_section.h"
 
-#include <cstdint>
 #include <cstring>
 
 namespace plat::elf {
@@ -13,10 +13,6 @@ std::uint64_t Read(const std::string& b, std::size_t at, int size) {
     std::uint64_t v = 0;
     for (int i = size - 1; i >= 0; --i) v = (v << 8) | static_cast<unsigned char>(b[at + i]);
     return v;
-}
-
-bool Fits(const std::string& b, std::uint64_t at, std::uint64_t n) {
-    return at <= b.size() && n <= b.size() - at;
 }
 
 struct Header {
@@ -32,14 +28,26 @@ struct Layout {
 constexpr Layout kElf32{4, 0x20, 0x2E, 0x30, 0x32, 0, 16, 20};
 constexpr Layout kElf64{8, 0x28, 0x3A, 0x3C, 0x3E, 0, 24, 32};
 
-bool SectionHeader(const std::string& b, const Layout& l, std::uint64_t table, std::uint64_t entSize,
+bool SectionHeader(const ByteSource& f, const Layout& l, std::uint64_t table, std::uint64_t entSize,
                    std::uint64_t index, Header* h) {
-    std::uint64_t at = table + index * entSize;
-    if (!Fits(b, at, entSize) || entSize < l.shSize + l.word) return false;
-    h->nameOffset = Read(b, at + l.shName, 4);
-    h->offset = Read(b, at + l.shOffset, l.word);
-    h->size = Read(b, at + l.shSize, l.word);
+    const std::size_t used = l.shSize + static_cast<std::size_t>(l.word);
+    std::string b;
+    if (entSize < used || !f.ReadAt(table + index * entSize, used, &b)) return false;
+    h->nameOffset = Read(b, l.shName, 4);
+    h->offset = Read(b, l.shOffset, l.word);
+    h->size = Read(b, l.shSize, l.word);
     return true;
+}
+
+// Whether the name at offset in the names section is exactly name (its terminating NUL, or the
+// section's end, included).
+bool NameIs(const ByteSource& f, const Header& names, std::uint64_t offset, const std::string& name) {
+    if (offset >= names.size) return false;
+    const std::uint64_t left = names.size - offset;
+    const std::size_t n = left > name.size() ? name.size() + 1 : static_cast<std::size_t>(left);
+    std::string bytes;
+    if (!f.ReadAt(names.offset + offset, n, &bytes)) return false;
+    return strnlen(bytes.data(), n) == name.size() && bytes.compare(0, name.size(), name) == 0;
 }
 
 }  // namespace
@@ -48,26 +56,29 @@ bool LooksLikeElf(const std::string& file) {
     return file.size() >= 4 && std::memcmp(file.data(), "\x7F" "ELF", 4) == 0;
 }
 
-bool SectionContents(const std::string& b, const std::string& name, std::string* contents) {
-    if (!LooksLikeElf(b) || !Fits(b, 0, 0x40) || b[5] != 1) return false;  // little-endian only
+bool SectionContents(const ByteSource& f, const std::string& name, std::uint64_t maxSize,
+                     std::string* contents) {
+    std::string b;
+    if (!f.ReadAt(0, 0x40, &b) || !LooksLikeElf(b) || b[5] != 1) return false;  // little-endian only
     const Layout& l = b[4] == 2 ? kElf64 : kElf32;
     std::uint64_t table = Read(b, l.shoff, l.word), entSize = Read(b, l.shentsize, 2);
     std::uint64_t count = Read(b, l.shnum, 2), namesIndex = Read(b, l.shstrndx, 2);
     Header names;
-    if (!SectionHeader(b, l, table, entSize, namesIndex, &names) || !Fits(b, names.offset, names.size))
+    if (!SectionHeader(f, l, table, entSize, namesIndex, &names) || names.offset > f.Size() ||
+        names.size > f.Size() - names.offset)
         return false;
     for (std::uint64_t i = 0; i < count; ++i) {
         Header h;
-        if (!SectionHeader(b, l, table, entSize, i, &h)) return false;
-        if (h.nameOffset >= names.size) continue;
-        const char* n = b.data() + names.offset + h.nameOffset;
-        std::size_t max = static_cast<std::size_t>(names.size - h.nameOffset);
-        if (strnlen(n, max) != name.size() || name.compare(0, name.size(), n, name.size()) != 0) continue;
-        if (!Fits(b, h.offset, h.size)) return false;
-        *contents = b.substr(static_cast<std::size_t>(h.offset), static_cast<std::size_t>(h.size));
-        return true;
+        if (!SectionHeader(f, l, table, entSize, i, &h)) return false;
+        if (!NameIs(f, names, h.nameOffset, name)) continue;
+        return h.size <= maxSize && f.ReadAt(h.offset, static_cast<std::size_t>(h.size), contents);
     }
     return false;
+}
+
+bool SectionContents(const std::string& file, const std::string& name, std::uint64_t maxSize,
+                     std::string* contents) {
+    return SectionContents(MemorySource(file), name, maxSize, contents);
 }
 
 }  // namespace plat::elf

@@ -605,25 +605,29 @@ std::string ModuleFileName(const void* addressInModule) {
     return paths::ToWindows(host);
 }
 
-bool ReadAll(const std::string& path, std::string* bytes) {
+bool ReadAll(const std::string& path, std::string* bytes, std::uint64_t maxBytes) {
     std::string host;
     struct stat st;
     int fd = -1;
     if (!HostOf(path, &host) || !OpenSource(host, &st, &fd)) return false;
     bytes->clear();
     char buffer[1 << 16];
-    ssize_t n;
-    while ((n = read(fd, buffer, sizeof buffer)) != 0) {
+    ssize_t n = 0;
+    std::uint32_t error = 0;
+    if (static_cast<std::uint64_t>(st.st_size) > maxBytes) error = kErrorFileTooLarge;
+    while (error == 0 && (n = read(fd, buffer, sizeof buffer)) != 0) {
         if (n < 0 && errno == EINTR) continue;
         if (n < 0) {
-            const int err = errno;
-            close(fd);
-            return Fail(ErrorFromErrno(err));
+            error = ErrorFromErrno(errno);
+        } else if (bytes->size() + static_cast<std::size_t>(n) > maxBytes) {
+            error = kErrorFileTooLarge;
+        } else {
+            bytes->append(buffer, static_cast<std::size_t>(n));
         }
-        bytes->append(buffer, static_cast<std::size_t>(n));
     }
     close(fd);
-    return true;
+    if (error != 0) bytes->clear();
+    return error == 0 || Fail(error);
 }
 
 bool WriteAllDurably(const std::string& path, const std::string& bytes) {

@@ -233,18 +233,27 @@ std::string ModuleFileName(const void* addressInModule) {
     return std::string(buffer, n);
 }
 
-bool ReadAll(const std::string& path, std::string* bytes) {
+bool ReadAll(const std::string& path, std::string* bytes, std::uint64_t maxBytes) {
     // Reading is refused only when another opener denies it.
     Handle file(::CreateFileA(path.c_str(), GENERIC_READ,
                               FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE, nullptr,
                               OPEN_EXISTING, FILE_ATTRIBUTE_NORMAL, nullptr));
     if (!file) return false;
     bytes->clear();
+    LARGE_INTEGER size{};
+    if (!::GetFileSizeEx(file.get(), &size)) return false;
+    const auto tooLarge = [bytes] {
+        bytes->clear();
+        ::SetLastError(ERROR_FILE_TOO_LARGE);
+        return false;
+    };
+    if (static_cast<std::uint64_t>(size.QuadPart) > maxBytes) return tooLarge();
     char buffer[1 << 16];
     DWORD n = 0;
     for (;;) {
         if (!::ReadFile(file.get(), buffer, sizeof buffer, &n, nullptr)) return false;
         if (n == 0) return true;
+        if (bytes->size() + n > maxBytes) return tooLarge();
         bytes->append(buffer, n);
     }
 }

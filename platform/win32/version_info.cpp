@@ -5,7 +5,7 @@
 #include <vector>
 
 #include "platform/errors.h"
-#include "platform/files.h"
+#include "platform/regular_file.h"
 #include "platform/pe_resources.h"
 #include "platform/win32/windows_api.h"
 
@@ -25,10 +25,10 @@ bool Unavailable(const std::string& winPath, DWORD error) {
         error == ERROR_ACCESS_DENIED || error == ERROR_SHARING_VIOLATION) {
         return Fail(error);
     }
-    std::string image;
-    if (!files::ReadAll(winPath, &image)) return false;
-    std::string unused;
-    const bool module = pe::LooksLikeImage(image) &&
+    // Only the headers are read, and only of a regular file: anything else is no module.
+    files::RegularFile image;
+    std::string start, unused;
+    const bool module = image.Open(winPath) && image.ReadAt(0, 2, &start) && pe::LooksLikeImage(start) &&
                         pe::FirstResourceOfType(image, pe::kRtVersion, &unused) != pe::Lookup::NotImage;
     return Fail(module ? kErrorResourceTypeNotFound : kErrorResourceDataNotFound);
 }

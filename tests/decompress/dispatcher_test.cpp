@@ -180,9 +180,15 @@ protected:
     CDecompressionObjects dispatcher_;
 };
 
+// Only a download that needs expanding is given to the dispatcher: one without a method fails,
+// so that its compressed bytes are never installed.
 TEST_F(InPlaceExpansion, CodesWithoutExpansion) {
-    EXPECT_TRUE(Expand(kCompressionNone, "payload"));
-    EXPECT_EQ(trace_.Lines()[1], "CDecompressionObjects::DecompressNone, file is C:\\dl\\app.exe");
+    EXPECT_FALSE(Expand(kCompressionNone, "payload"));
+    EXPECT_EQ(trace_.Lines(), (Lines{"CDecompressionObjects::Decompress, file is C:\\dl\\app.exe",
+                                     "CDecompressionObjects::DecompressNone, file is C:\\dl\\app.exe",
+                                     "CDecompressionObjects::DecompressNone, the file needs decompression but its "
+                                     "download type is None, so it cannot be expanded",
+                                     "CDecompressionObjects::Decompress, returning 0"}));
     EXPECT_FALSE(Expand(kCompressionRTPatch, "payload")) << "a patch is never the file itself";
     EXPECT_EQ(trace_.Lines(), (Lines{"CDecompressionObjects::Decompress, file is C:\\dl\\app.exe",
                                      "CDecompressionObjects::DecompressRTPatch, file is C:\\dl\\app.exe THIS FUNCTION NOT IMPLEMENTED YET",

@@ -9,6 +9,7 @@
 #include "diag/trace_startup.h"
 #include "platform/errors.h"
 #include "platform/fault.h"
+#include "platform/files.h"
 #include "tests/support/test_machine.h"
 #include "tests/support/trace_capture.h"
 
@@ -82,8 +83,16 @@ TEST_F(TraceLogTest, FileThatCannotBeOpenedSwitchesFileOutputOff) {
     TRACE(g_TraceLog, "lost");
     EXPECT_FALSE(g_TraceLog.fileOutput);
     holder.reset();
-    TRACE(g_TraceLog, "also lost: nothing reopens the file");
+    TRACE(g_TraceLog, "also lost: the rest of the run writes nowhere");
     EXPECT_EQ(trace.Bytes(), "");
+
+    // The next run tries the file again; a log switched off on purpose stays off.
+    g_TraceLog.ResumeFileOutput();
+    TRACE(g_TraceLog, "next run");
+    EXPECT_EQ(trace.Lines(), Lines{"next run"});
+    g_TraceLog.fileOutput = false;
+    g_TraceLog.ResumeFileOutput();
+    EXPECT_FALSE(g_TraceLog.fileOutput);
 }
 
 TEST_F(TraceLogTest, FailedWriteDropsTheRestOfThatLineOnly) {
@@ -113,6 +122,25 @@ protected:
     pextest::TestMachine m;
     TraceLog log;
 };
+
+// The previous log goes only once it is safe in the backup: a failed copy keeps it, and the
+// new run's lines follow it.
+TEST_F(TraceStartupTest, RotationKeepsThePreviousLogWhenItsBackupCannotBeWritten) {
+    const std::string logFile = "C:\\Suite\\log\\pex_support_mendler.log";
+    const std::string backup = "C:\\Suite\\log\\pex_support_mendler.bak";
+    m.WriteFile(logFile, "the run before\r\n");
+    m.WriteFile(backup, "two runs before\r\n");
+    plat::fault::FailNth(plat::fault::Op::Copy, 1, plat::kErrorDiskFull);
+    ConfigureTraceLog(log, "C:\\Suite\\Mendler.dll");
+    plat::fault::Clear();
+    TRACE(log, "this run");
+    EXPECT_EQ(pextest::TraceLines(m.ReadFile(logFile)), (Lines{"the run before", "this run"}));
+    EXPECT_EQ(m.ReadFile(backup), "two runs before\r\n");
+
+    ConfigureTraceLog(log, "C:\\Suite\\Mendler.dll");  // the copy succeeds again
+    EXPECT_FALSE(plat::files::Exists(logFile));
+    EXPECT_EQ(pextest::TraceLines(m.ReadFile(backup)), (Lines{"the run before", "this run"}));
+}
 
 TEST_F(TraceStartupTest, CreatesTheLogFolderWithItsParentsAndInstallsTheSubstitution) {
     ConfigureTraceLog(log, "C:\\Deep\\Er\\Mendler.dll");

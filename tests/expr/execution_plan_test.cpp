@@ -94,8 +94,7 @@ TEST_F(ExecutionPlanTest, TheCurrentPlanReceivesThePushes) {
     }
     EXPECT_EQ(&CurrentPlan(), &DefaultPlan());
     std::size_t before = DefaultPlan().Items().size();
-    COverrideExpression value = COverrideExpression::FromBool(true);
-    MakeAssignment(COverrideExpression::FromString("FORCED"), value);
+    MakeAssignment(COverrideExpression::FromString("FORCED"), COverrideExpression::FromBool(true));
     EXPECT_EQ(DefaultPlan().Items().size(), before + 1);
 }
 

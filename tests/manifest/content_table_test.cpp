@@ -33,20 +33,36 @@ std::string Load(const std::string& bytes, bool header = true) {
 
 const std::string kFailed = "failed " + std::to_string(CContentTable::kFail);
 
-// Any line end; the table ends at the first empty line, and nothing after it is read, not even
-// a row that would fail the load.
-TEST(ContentTableLoad, LineEndsAndTheFirstEmptyLine) {
+// Any line end. An empty line ends the table when it ends in CR LF, and nothing after it is
+// read, not even a row that would fail the load; one that ends in LF or CR alone is passed over.
+TEST(ContentTableLoad, LineEndsAndEmptyLines) {
     for (const char* text : {"A,B\r\n1,2\r\n3,4\r\n", "A,B\n1,2\n3,4\n", "A,B\r1,2\r3,4\r",
-                             "A,B\r\n1,2\n3,4", "A,B\r1,2\r\n3,4\n"}) {
+                             "A,B\r\n1,2\n3,4", "A,B\r1,2\r\n3,4\n", "A,B\n1,2\n\n3,4\n",
+                             "A,B\r1,2\r\r3,4\r", "A,B\r\n1,2\r\n\n3,4\r\n", "A,B\r\n1,2\r\n\r3,4\r\n",
+                             "A,B\n\n\r1,2\n\r3,4\n"}) {
         EXPECT_EQ("A|B;1|2;3|4", Load(text)) << text;
     }
-    for (const char* text : {"A,B\r\n1,2\r\n\r\n3,4\r\n", "A,B\n1,2\n\n3,4\n", "A,B\r1,2\r\r3,4\r",
-                             "A,B\r\n1,2\r\n\n3,4\r\n", "A,B\r\n1,2\r\n\r3,4\r\n"}) {
-        EXPECT_EQ("A|B;1|2", Load(text)) << text;
-    }
+    EXPECT_EQ("A|B;1|2", Load("A,B\r\n1,2\r\n\r\n3,4\r\n"));
+    EXPECT_EQ("A|B;1|2", Load("A,B\n1,2\n\r\n3,4\n"));
     EXPECT_EQ("A|B|C", Load("A,B,C\r\n\r\nx,y,z,too,many\r\n"));
     EXPECT_EQ("A|B", Load("A,B"));
+    EXPECT_EQ("A|B", Load("A,B\n\n"));
     for (const char* text : {"", "\r\nA,B\r\n", "\nA,B\n"}) EXPECT_EQ(kFailed, Load(text)) << text;
+}
+
+// What ordinary tools write: a byte-order mark, quoted names, blanks after the commas. The
+// names are written back plain.
+TEST(ContentTableLoad, HeaderNamesAreUnquotedAndTrimmed) {
+    CContentTable table;
+    ASSERT_EQ(CContentTable::kOk,
+              table.LoadFromText("\xEF\xBB\xBF\"FileName\",\"UpgradeStatus\", Force Download ,\" A \",\t\r\n"
+                                 "f.dll,Downloaded, 1\r\n"));
+    EXPECT_EQ("FileName|UpgradeStatus|Force Download| A |;f.dll|Downloaded| 1||", Dump(table));
+    EXPECT_EQ(2, table.ColumnIndex("force download"));
+    EXPECT_EQ("FileName,UpgradeStatus,Force Download, A ,\r\nf.dll,Downloaded, 1,,\r\n", table.ToFileText());
+    // Only the file's first bytes can be a byte-order mark.
+    EXPECT_EQ("A|B;\xEF\xBB\xBFx|y", Load("\xEF\xBB\xBF" "A,B\r\n\xEF\xBB\xBFx,y\r\n"));
+    EXPECT_EQ("|;a|b", Load("\xEF\xBB\xBF" "a,b\r\n", false));
 }
 
 TEST(ContentTableLoad, CommasAndQuotes) {
@@ -64,11 +80,52 @@ TEST(ContentTableLoad, ShortRowsFillUpLongRowsFail) {
     EXPECT_EQ(0u, table.RowCount());
 }
 
+// The reason names the line, counted from the header as line 1, blank lines included; a load
+// that succeeds has none.
+TEST(ContentTableLoad, AFailedLoadSaysWhy) {
+    CContentTable table;
+    EXPECT_EQ(CContentTable::kFail, table.LoadFromText("FileName,UpgradeStatus\na,b\n\na,\"Dec 31, 2003\"\n"));
+    EXPECT_EQ("line 4 has more cells than the 2 columns of the header", table.LoadFailure());
+    EXPECT_EQ(CContentTable::kFail, table.LoadFromText("\xEF\xBB\xBF\r\nA\r\n"));
+    EXPECT_EQ("line 1 is empty, there is no header", table.LoadFailure());
+    EXPECT_EQ(CContentTable::kOk, table.LoadFromText("A\r\n"));
+    EXPECT_EQ("", table.LoadFailure());
+    EXPECT_EQ(CContentTable::kFail, table.FailLoad("no column X"));
+    EXPECT_EQ(0u, table.ColumnCount());
+    EXPECT_EQ("no column X", table.LoadFailure());
+}
+
+std::string Repeat(const std::string& text, std::size_t times) {
+    std::string out;
+    out.reserve(text.size() * times);
+    for (std::size_t i = 0; i < times; ++i) out += text;
+    return out;
+}
+
+// Files far beyond any product fail instead of exhausting memory. 5,000 columns and 200,000
+// short rows (about 1 MB) would otherwise ask for 10^9 cells.
+TEST(ContentTableLoad, BoundsOnColumnsAndCells) {
+    const std::uint32_t maxColumns = CContentTable::kMaxColumns;
+    const std::uint64_t rowsAtBound = CContentTable::kMaxCells / maxColumns;
+    CContentTable table;
+    EXPECT_EQ(CContentTable::kFail, table.LoadFromText(Repeat("c,", 5000) + "\r\n" + Repeat("x\r\n", 200000)));
+    EXPECT_EQ("line 1 has more than 1000 columns", table.LoadFailure());
+    EXPECT_EQ(CContentTable::kFail, table.LoadFromText(Repeat("x,", maxColumns + 1), false));
+
+    const std::string header = Repeat("c,", maxColumns) + "\r\n";
+    EXPECT_EQ(CContentTable::kOk, table.LoadFromText(header + Repeat("x\r\n", rowsAtBound)));
+    EXPECT_EQ(rowsAtBound, table.RowCount());
+    EXPECT_EQ(CContentTable::kFail, table.LoadFromText(header + Repeat("x\r\n", rowsAtBound + 1)));
+    EXPECT_EQ("line " + std::to_string(rowsAtBound + 2) + " takes the table past 4000000 cells", table.LoadFailure());
+    EXPECT_EQ(0u, table.RowCount());
+}
+
 TEST(ContentTableAccess, ColumnsByNameAndCellsOutsideTheTable) {
     CContentTable table;
     table.LoadFromText("FileName,UpgradeStatus,FILENAME\r\nf,s,g\r\n");
     EXPECT_EQ(0, table.ColumnIndex("filename"));
     EXPECT_EQ(-1, table.ColumnIndex("File"));
+    EXPECT_EQ(-1, table.ColumnIndex("Fxxxxxxx"));
     EXPECT_EQ("", table.Cell(1, 0));
     EXPECT_EQ("", table.Field(0, "Command"));
     EXPECT_FALSE(table.SetCell(1, 0, "x"));
@@ -133,7 +190,24 @@ TEST_F(ContentTableFile, LoadsAndWritesBack) {
     EXPECT_EQ("\r\n", machine_.ReadFile("C:\\empty.csv"));
 
     EXPECT_EQ(static_cast<std::int32_t>(0x80070002u), table.LoadFromFile("C:\\missing.csv"));
+    EXPECT_EQ("cannot read the file (error 2)", table.LoadFailure());
     EXPECT_EQ(static_cast<std::int32_t>(0x80070003u), table.LoadFromFile("C:\\no\\such.csv"));
+}
+
+// The size decides before anything is read: a sparse file one byte past the bound is refused
+// at once.
+TEST_F(ContentTableFile, AFileLargerThanTheBoundIsNotRead) {
+    const std::string path = "C:\\Pex\\huge.csv";
+    machine_.WriteFile(path, "");
+    {
+        plat::CFile file;
+        ASSERT_TRUE(file.Open(path, plat::CFile::modeWrite | plat::CFile::modeNoTruncate));
+        file.Seek(static_cast<std::int64_t>(CContentTable::kMaxFileBytes), plat::CFile::begin);
+        file.Write("x", 1);
+    }
+    CContentTable table;
+    EXPECT_EQ(static_cast<std::int32_t>(0x800700DFu), table.LoadFromFile(path));
+    EXPECT_EQ("the file is larger than 67108864 bytes", table.LoadFailure());
 }
 
 // A save that the platform refuses leaves the previous file byte for byte, no temporary file

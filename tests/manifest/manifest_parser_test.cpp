@@ -7,6 +7,8 @@
 
 #include <array>
 
+#include "platform/errors.h"
+#include "platform/fault.h"
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "tests/support/test_machine.h"
@@ -170,12 +172,12 @@ TEST_F(ManifestParser, LoadPreparesRowsAndReadsTheMode) {
 
 TEST_F(ManifestParser, RowScriptsRunUnescapedAndFailuresDoNotStopTheLoad) {
     Publish("",
-            "FileName,Force Download,DynamicFieldInfo\n"
-            "a.dll,0,FORCED = AND(TRUE&#x2C; TRUE)\n"
-            "b.dll,0,FORCED = AND(TRUE&#x2c; FALSE)\n"
-            "c.dll,0,\n"
-            "d.dll,1,FORCED = NoSuchColumn\n"
-            "e.dll,0,FORCED = (\n");
+            "FileName,UpgradeStatus,Force Download,DynamicFieldInfo\n"
+            "a.dll,,0,FORCED = AND(TRUE&#x2C; TRUE)\n"
+            "b.dll,,0,FORCED = AND(TRUE&#x2c; FALSE)\n"
+            "c.dll,,0,\n"
+            "d.dll,,1,FORCED = NoSuchColumn\n"
+            "e.dll,,0,FORCED = (\n");
     ASSERT_TRUE(Load(parser));
     const std::vector<std::string> forced = {"1", "0", "0", "1", "0"};
     for (std::int32_t row = 0; row < 5; ++row) {
@@ -189,15 +191,75 @@ TEST_F(ManifestParser, RowScriptsRunUnescapedAndFailuresDoNotStopTheLoad) {
     EXPECT_TRUE(trace.Contains("Error Creating Plan"));
 }
 
-TEST_F(ManifestParser, AnUnloadableContentFileIsDiscardedWithItsEntries) {
-    Publish("", "FileName,UpgradeStatus\na,b,c\n");
+// A parser driven for a second product keeps nothing of the first one's content file, also
+// when the second product has none.
+TEST_F(ManifestParser, ARunKeepsNothingOfTheContentFileOfTheRunBefore) {
+    Publish("MandatoryOnly", "FileName,UpgradeStatus\r\na.dll,Skipped\r\n");
     EXPECT_EQ(parser.ProcessUpdateInformation(_bstr_t("Zendor32"), nullptr), 0);
-    EXPECT_TRUE(trace.Contains("CManifestParser: ProcessUpdateInformation, Unable to load Content file"));
+    ASSERT_TRUE(parser.MandatoryOnly());
+    pextest::CreateRegKey(reg::kLocalMachine, "Software\\Vantric\\Pex\\Orlandel");
+    EXPECT_EQ(parser.ProcessUpdateInformation(_bstr_t("Orlandel"), nullptr), 0);
+    EXPECT_EQ(parser.Table().ColumnCount(), 0u);
+    EXPECT_EQ(parser.ContentFilePath(), "");
+    EXPECT_EQ(parser.ContentFileTarget(), "");
+    EXPECT_FALSE(parser.MandatoryOnly());
+    EXPECT_FALSE(parser.MoveToRow(0));
+}
+
+bool EntriesPresent() {
+    std::string bytes;
     for (const char* name : {"ContentFileName", "ContentFileMode", "ContentFileTarget"}) {
-        std::string bytes;
-        EXPECT_FALSE(pextest::GetRegValue(reg::kLocalMachine, kSection, name, &bytes)) << name;
+        if (pextest::GetRegValue(reg::kLocalMachine, kSection, name, &bytes)) return true;
     }
+    return false;
+}
+
+// A quoted date holds a comma, so its row has too many cells: the file is moved aside for
+// support staff, replacing an older one, and the product counts as failed.
+TEST_F(ManifestParser, AnUnloadableContentFileIsKeptAsideAndCounted) {
+    const std::string bytes = "FileName,UpgradeStatus,UpdateDate\r\na.dll,Downloaded,\"Dec 31, 2003\"\r\n";
+    const std::string kept = std::string(kContent) + ".rejected";
+    Publish("", bytes);
+    machine.WriteFile(kept, "an older rejected file");
+    EXPECT_EQ(parser.ProcessUpdateInformation(_bstr_t("Zendor32"), nullptr), 1);
+    EXPECT_TRUE(trace.Contains("CManifestParser: ProcessUpdateInformation, content file '" + std::string(kContent) +
+                               "' rejected: line 2 has more cells than the 3 columns of the header"));
+    EXPECT_TRUE(trace.Contains("CManifestParser: ProcessUpdateInformation, rejected content file kept as '" + kept +
+                               "'"));
+    EXPECT_TRUE(trace.Contains("CManifestParser: ProcessUpdateInformation, Unable to load Content file"));
+    EXPECT_FALSE(EntriesPresent());
     EXPECT_FALSE(plat::files::Exists(kContent));
+    EXPECT_EQ(machine.ReadFile(kept), bytes);
+
+    // A table without a column the analysis needs is rejected the same way.
+    Publish("", "FileName,Status\r\na.dll,Downloaded\r\n");
+    EXPECT_EQ(parser.ProcessUpdateInformation(_bstr_t("Zendor32"), nullptr), 1);
+    EXPECT_TRUE(trace.Contains("CManifestParser: ProcessUpdateInformation, content file '" + std::string(kContent) +
+                               "' rejected: there is no column UpgradeStatus"));
+    EXPECT_EQ(machine.ReadFile(kept), "FileName,Status\r\na.dll,Downloaded\r\n");
+
+    // A missing file: nothing to keep, the entries go, and there is no failure to count.
+    Publish("", "");
+    ASSERT_TRUE(plat::files::Remove(kContent));
+    ASSERT_TRUE(plat::files::Remove(kept));
+    EXPECT_EQ(parser.ProcessUpdateInformation(_bstr_t("Zendor32"), nullptr), 0);
+    EXPECT_FALSE(EntriesPresent());
+    EXPECT_FALSE(plat::files::Exists(kept));
+}
+
+// A move that fails never costs the file: it stays, with the entries that name it, for the
+// next run to meet again.
+TEST_F(ManifestParser, ARejectedFileThatCannotBeMovedStaysInPlace) {
+    const std::string bytes = "Name\r\n";
+    Publish("", bytes);
+    plat::fault::FailNth(plat::fault::Op::Rename, 1, plat::kErrorSharingViolation, true);
+    EXPECT_EQ(parser.ProcessUpdateInformation(_bstr_t("Zendor32"), nullptr), 1);
+    plat::fault::Clear();
+    EXPECT_EQ(machine.ReadFile(kContent), bytes);
+    EXPECT_FALSE(plat::files::Exists(std::string(kContent) + ".rejected"));
+    EXPECT_TRUE(EntriesPresent());
+    EXPECT_TRUE(trace.Contains("CManifestParser: ProcessUpdateInformation, rejected content file not moved to '" +
+                               std::string(kContent) + ".rejected' (error 32), left in place"));
 }
 
 }  // namespace

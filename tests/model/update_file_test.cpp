@@ -48,9 +48,9 @@ TEST_F(UpdateFile, DecompressesInPlaceThroughOneSharedDecompressor) {
     EXPECT_TRUE(trace.Contains("CFile_::Decompress return value is 0"));
 
     trace.Clear();
-    CFile_ plain(1, true, false, "C:\\App", "a.dll", kDownload, "", "", true, 0);
-    EXPECT_TRUE(plain.Decompress(nullptr));
-    EXPECT_FALSE(plain.IsDecompressionNeeded());
+    CFile_ plain(1, true, false, "C:\\App", "a.dll", kDownload, "", "", true, 0);  // None: no expansion
+    EXPECT_FALSE(plain.Decompress(nullptr));
+    EXPECT_TRUE(plain.IsDecompressionNeeded());
     EXPECT_FALSE(trace.Contains("CFile_::Decompress, creating Decompressor"));
 }
 

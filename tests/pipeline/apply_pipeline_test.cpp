@@ -125,6 +125,32 @@ TEST_F(ApplyPipeline, AFailingMemberRollsTheWholeGroupBack) {
     EXPECT_TRUE(plat::files::Exists("C:\\Pex\\cache\\one.dll.new"));  // downloads kept for the next run
 }
 
+// A host may drive several products with one parser and fill its special-file list once: each
+// run starts with nothing of the one before, so a group that failed for the first product is
+// neither applied again nor recorded in the second product's content file.
+TEST_F(ApplyPipeline, OneParserRunsSeveralProductsEachOnItsOwn) {
+    const std::string otherContent = "C:\\Pex\\Orlandel_content.txt";
+    ContentRow failing = Row("failing.dll", "f", "G");
+    failing["Command"] = "[RUN]nosuchprogram.exe";
+    Publish({Row("Zendor32.exe", "host"), failing});
+    CManifestParser parser;
+    parser.AddToSpecialList("zendor32.exe");
+    EXPECT_EQ(parser.ProcessUpdateInformation(_bstr_t(kProduct), nullptr), 1);
+    EXPECT_TRUE(parser.WasSpecialFileUpdateAttempted());
+    const std::string firstContent = machine.ReadFile(kContent);
+
+    Publish({Row("other.dll", "other")}, "", "Orlandel", otherContent);
+    machine.WriteFile("C:\\App\\Zendor32.exe", "changed since");
+    EXPECT_EQ(parser.ProcessUpdateInformation(_bstr_t("Orlandel"), nullptr), 0);
+    EXPECT_FALSE(parser.WasSpecialFileUpdateAttempted());
+    EXPECT_EQ(parser.SpecialFiles().count("ZENDOR32.EXE"), 1u);
+    EXPECT_EQ(Installed("other.dll"), "other");
+    EXPECT_EQ(Installed("Zendor32.exe"), "changed since");
+    EXPECT_EQ(Count("CManifestParser: considering applying file 'failing.dll'"), 1);
+    EXPECT_FALSE(plat::files::Exists(otherContent));
+    EXPECT_EQ(machine.ReadFile(kContent), firstContent);
+}
+
 TEST_F(ApplyPipeline, MandatoryOnlyTakesForcedRowsThatCannotBeSnoozed) {
     ContentRow forced = Row("forced.dll", "f");
     forced["Force Download"] = "1";

@@ -34,9 +34,10 @@ std::vector<std::string> ColumnsOf(const std::vector<ContentRow>& rows) {
 
 }  // namespace
 
-void PipelineTest::Publish(const std::vector<ContentRow>& rows, const std::string& mode) {
-    const std::string section = std::string("Software\\Vantric\\Pex\\") + kProduct;
-    SetRegText(reg::kLocalMachine, section, "ContentFileName", kContent);
+void PipelineTest::Publish(const std::vector<ContentRow>& rows, const std::string& mode, const std::string& product,
+                           const std::string& content) {
+    const std::string section = "Software\\Vantric\\Pex\\" + product;
+    SetRegText(reg::kLocalMachine, section, "ContentFileName", content);
     SetRegText(reg::kLocalMachine, section, "ContentFileMode", mode);
     SetRegText(reg::kLocalMachine, section, "ContentFileTarget", "");
     const std::vector<std::string> columns = ColumnsOf(rows);
@@ -49,7 +50,7 @@ void PipelineTest::Publish(const std::vector<ContentRow>& rows, const std::strin
         }
         text += Join(cells);
     }
-    machine.WriteFile(kContent, text);
+    machine.WriteFile(content, text);
 }
 
 ContentRow PipelineTest::Row(const std::string& fileName, const std::string& bytes, const std::string& group,

@@ -24,7 +24,8 @@ protected:
 
     // Registers the product with its content file and mode; writes the content file, with a
     // column for every cell name that some row has.
-    void Publish(const std::vector<ContentRow>& rows, const std::string& mode = "");
+    void Publish(const std::vector<ContentRow>& rows, const std::string& mode = "",
+                 const std::string& product = kProduct, const std::string& content = kContent);
     // A row installing fileName from a download of bytes (C:\Pex\cache\<fileName>.new), in
     // status Downloaded.
     ContentRow Row(const std::string& fileName, const std::string& bytes, const std::string& group = "",

@@ -10,6 +10,7 @@
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "platform/pe_resources.h"
+#include "platform/regular_file.h"
 #include "tests/support/environment.h"
 #include "tests/support/test_machine.h"
 
@@ -87,6 +88,63 @@ TEST(VersionInfo, FilesWithoutVersionInformation) {
     EXPECT_FALSE(plat::ver::Read("C:\\notes.txt", &info));
     EXPECT_EQ(plat::LastError(), plat::ver::kErrorResourceDataNotFound);
     EXPECT_FALSE(plat::ver::Read("C:\\missing.dll", &info));
+    EXPECT_EQ(plat::LastError(), 2u);
+#ifndef _WIN32
+    // Devices have no version information, and are not read.
+    EXPECT_FALSE(plat::ver::Read("Z:\\dev\\zero", &info));
+    EXPECT_EQ(plat::LastError(), plat::ver::kErrorResourceDataNotFound);
+#endif
+}
+
+std::uint32_t U32At(const std::string& b, std::size_t at) {
+    std::uint32_t v = 0;
+    for (int i = 3; i >= 0; --i) v = (v << 8) | static_cast<unsigned char>(b[at + static_cast<std::size_t>(i)]);
+    return v;
+}
+
+// The resource lookup trusts nothing the headers say beyond what they hold.
+TEST(VersionInfo, ResourceLookupFollowsOnlyHeadersThatHoldTogether) {
+    pextest::TestMachine m;
+    std::string file;
+    ASSERT_TRUE(plat::files::ReadAll(Fixture(), &file));
+    std::string data;
+    EXPECT_EQ(plat::pe::FirstResourceOfType(file, 3, &data), plat::pe::Lookup::NotFound);  // no icons
+    const std::size_t pe = U32At(file, 60), opt = pe + 24;
+    const std::size_t optSize = U32At(file, pe + 20) & 0xFFFF;
+    // A section table cut short.
+    EXPECT_EQ(plat::pe::FirstResourceOfType(file.substr(0, opt + optSize + 20), plat::pe::kRtVersion, &data),
+              plat::pe::Lookup::NotImage);
+    // Two data directories only: the resource directory (the third) is not there.
+    const std::size_t dirCount = opt + ((U32At(file, opt) & 0xFFFF) == 0x10B ? 92 : 108);
+    std::string twoDirectories = file;
+    twoDirectories[dirCount] = 2;
+    EXPECT_EQ(plat::pe::FirstResourceOfType(twoDirectories, plat::pe::kRtVersion, &data),
+              plat::pe::Lookup::NoResources);
+}
+
+// Version information is read piece by piece, and only from regular files.
+TEST(RegularFile, OpensOnlyRegularFilesAndReadsWholePiecesInside) {
+    pextest::TestMachine m;
+    m.WriteFile("C:\\pextest_pieces\\a.bin", "0123456789");
+    plat::files::RegularFile file;
+    ASSERT_TRUE(file.Open("C:\\pextest_pieces\\a.bin"));
+    EXPECT_EQ(file.Size(), 10u);
+    std::string bytes;
+    EXPECT_TRUE(file.ReadAt(3, 4, &bytes));
+    EXPECT_EQ(bytes, "3456");
+    EXPECT_TRUE(file.ReadAt(6, 4, &bytes));
+    EXPECT_EQ(bytes, "6789");
+    EXPECT_TRUE(file.ReadAt(9, 1, &bytes));
+    EXPECT_EQ(bytes, "9");
+    EXPECT_FALSE(file.ReadAt(8, 3, &bytes));
+    EXPECT_FALSE(file.ReadAt(~std::uint64_t{0}, 2, &bytes));
+    EXPECT_FALSE(file.Open("C:\\pextest_pieces\\a.bin"));  // already open
+
+    plat::files::RegularFile folder, missing;
+    EXPECT_FALSE(folder.Open("C:\\pextest_pieces"));
+    EXPECT_EQ(plat::LastError(), plat::kErrorAccessDenied);
+    EXPECT_FALSE(folder.ReadAt(0, 0, &bytes));
+    EXPECT_FALSE(missing.Open("C:\\pextest_pieces\\none.bin"));
     EXPECT_EQ(plat::LastError(), 2u);
 }
 

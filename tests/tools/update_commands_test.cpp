@@ -46,6 +46,18 @@ TEST(UpdateCommands, ScriptIsCheckedAndTriedOnARowWithoutChangingTheFile) {
     EXPECT_EQ(RunPex(machine, "script 'FORCED = ' ").exit, 1);
 }
 
+// Found by review: an assignment to a column the content file lacks stored nothing, and the
+// tool showed the plan as run with no sign of it.
+TEST(UpdateCommands, ScriptSaysWhatARowCouldNotStore) {
+    pextest::TestMachine machine;
+    machine.WriteFile("C:\\content.csv", "FileName,HomeDir\r\na.dll,C:\\App\r\n");
+    pextest::CommandOutcome tried = RunPex(machine, "script 'FORCED = TRUE' --row 'C:\\content.csv:0'");
+    EXPECT_EQ(tried.exit, 0) << tried.out;  // the plan succeeds, as in a real run
+    EXPECT_EQ(tried.out, "item 1: SET(FORCED, TRUE)\nvalid\n"
+                         "not stored: FORCED = 1: the content file has no column \"Force Download\"\n"
+                         "executed\n");
+}
+
 TEST(UpdateCommands, AllAndProductRunTheLibraryAndExplainWhereTheLogIs) {
     pextest::TestMachine machine;
     pextest::SetRegText(reg::kLocalMachine, "Software\\Vantric\\Pex\\Orlandel", "ContentFileName",
