@@ -23,7 +23,6 @@ namespace {
 struct Entry {
     ino_t ino = 0;
     bool folder = false;
-    bool operator==(const Entry& other) const { return ino == other.ino && folder == other.folder; }
 };
 using Listing = std::map<std::string, Entry>;
 
@@ -119,7 +118,7 @@ public:
         struct stat st;
         if (random_ && !live.empty() && stat(live.c_str(), &st) == 0 && st.st_ino == ino) {
             Listing now = CurrentListing(state_, live);
-            if (now != listing && Coin()) listing = now;
+            if (Coin()) listing = now;
         }
         for (const auto& [name, entry] : listing) {
             const std::string from = live.empty() ? live : live + "/" + name;
@@ -138,9 +137,7 @@ private:
         Content content = state_.contents[ino];  // a file never flushed is empty
         Content now;
         auto held = state_.held.find(ino);
-        if (random_ && held != state_.held.end() && CurrentContent(held->second, &now) &&
-            now.bytes != content.bytes && Coin())
-            content = now;
+        if (random_ && held != state_.held.end() && CurrentContent(held->second, &now) && Coin()) content = now;
         const int fd = open(out.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0600);
         if (fd < 0) return;
         if (write(fd, content.bytes.data(), content.bytes.size()) < 0) content.mode = 0;
