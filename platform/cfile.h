@@ -55,7 +55,8 @@ public:
     virtual std::uint64_t Seek(std::int64_t offset, unsigned from);
     virtual std::uint64_t GetLength() const;
     virtual std::uint64_t GetPosition() const;
-    // Flushes written data to the disk.
+    // Flushes written data to the disk; the first flush of a file that Open created also makes
+    // its name durable (on Windows the file system's log does so).
     virtual void Flush();
     virtual void Close();
     bool IsOpen() const { return fd_ >= 0 || handle_ != nullptr; }
@@ -65,6 +66,7 @@ protected:
     int fd_ = -1;             // posix backend
     void* handle_ = nullptr;  // win32 backend
     std::string path_;
+    bool newName_ = false;    // posix backend: Open created the file, its folder is not flushed yet
 };
 
 }  // namespace plat

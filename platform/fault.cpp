@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "platform/errors.h"
+#include "platform/power_cut.h"
 
 namespace plat::fault {
 
@@ -24,6 +25,8 @@ struct Plan {
     std::vector<Rule> rules;
     int mutations = 0;
     int crashAt = 0;  // 0: no crash planned
+    bool powerCut = false;
+    unsigned keepSeed = 0;
     int operations[static_cast<int>(Op::Any) + 1] = {};  // by kind; Any counts every kind
 };
 
@@ -49,6 +52,16 @@ void CrashAtMutation(int n) {
     Plan& plan = ThePlan();
     std::lock_guard<std::mutex> hold(plan.lock);
     plan.crashAt = n;
+    plan.powerCut = false;
+}
+
+void PowerCutAtMutation(int n, unsigned keepSeed) {
+    Plan& plan = ThePlan();
+    std::lock_guard<std::mutex> hold(plan.lock);
+    plan.crashAt = n;
+    if (!plan.powerCut) power::Start();
+    plan.powerCut = true;
+    plan.keepSeed = keepSeed;
 }
 
 void Clear() {
@@ -57,6 +70,8 @@ void Clear() {
     plan.rules.clear();
     plan.mutations = 0;
     plan.crashAt = 0;
+    if (plan.powerCut) power::Stop();
+    plan.powerCut = false;
     for (int& count : plan.operations) count = 0;
 }
 
@@ -64,7 +79,8 @@ bool Allow(Op op) {
     Plan& plan = ThePlan();
     std::lock_guard<std::mutex> hold(plan.lock);
     if (IsMutating(op) && ++plan.mutations == plan.crashAt) {
-        // A power cut: no destructors, no buffered output, no clean-up of any kind.
+        // No destructors, no buffered output, no clean-up of any kind.
+        if (plan.powerCut) power::Cut(plan.keepSeed);
         std::_Exit(kCrashExitCode);
     }
     ++plan.operations[static_cast<int>(op)];

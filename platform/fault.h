@@ -19,6 +19,13 @@ void FailNth(Op op, int n, std::uint32_t code, bool persistent = false);
 void CrashAtMutation(int n);
 constexpr int kCrashExitCode = 86;
 
+// As CrashAtMutation, and the power goes with the process: before it ends, the machine's drive C
+// is replaced by what would survive a power cut (platform/power_cut.h says what was made
+// durable). keepSeed 0 keeps nothing that was not made durable; another seed keeps a random
+// subset of those changes, the same subset for the same seed. Everything on drive C counts as
+// durable when the first such rule since the last Clear is set; a later one only moves the cut.
+void PowerCutAtMutation(int n, unsigned keepSeed = 0);
+
 // Removes every rule and resets the counters.
 void Clear();
 

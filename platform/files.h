@@ -22,7 +22,8 @@ using FileTime = std::uint64_t;
 
 // Copies src to dst. With failIfExists an existing dst gives 80. A copy never leaves a torn
 // target: it writes a temporary file beside dst, flushes it and renames it over dst. The
-// source's last-write time is kept.
+// source's last-write time is kept. The copy, bytes and name, survives a power cut once it
+// returns (on Windows the copy is flushed after CopyFile).
 bool Copy(const std::string& src, const std::string& dst, bool failIfExists);
 
 // Copy (overwriting) for a copy to keep, such as the backup of a file about to be replaced:
@@ -32,10 +33,13 @@ bool Copy(const std::string& src, const std::string& dst, bool failIfExists);
 // and takes no new file; flushed so that the name survives a power cut. Windows copies.
 bool CopyToKeep(const std::string& src, const std::string& dst);
 
-// Renames (moves) a file, replacing an existing target when replace is set.
+// Renames (moves) a file, replacing an existing target when replace is set. Written through:
+// the new name survives a power cut once it returns.
 bool Rename(const std::string& from, const std::string& to, bool replace);
 
-// Deletes a file (not a folder).
+// Deletes a file (not a folder). The emulated machine flushes the folder, so that the deletion
+// survives a power cut once it returns; Windows has no such call, and NTFS's log only keeps it
+// ahead of any later change that is flushed.
 bool Remove(const std::string& path);
 
 // Attributes of a file or folder; kInvalidAttributes and the last error when missing.

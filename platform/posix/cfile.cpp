@@ -12,6 +12,8 @@
 #include "platform/errors.h"
 #include "platform/fault.h"
 #include "platform/paths.h"
+#include "platform/posix/folder_flush.h"
+#include "platform/power_cut.h"
 
 namespace plat {
 
@@ -97,6 +99,7 @@ bool CFile::Open(const std::string& path, unsigned flags, CFileException* error)
     // written, or is in use, is never emptied. A folder opened for writing fails with EISDIR,
     // which is "access denied" too.
     int oflags = AccessFlags(flags) | O_CLOEXEC | ((flags & modeCreate) ? O_CREAT : 0);
+    const bool creating = (flags & modeCreate) && ::access(host.c_str(), F_OK) != 0;
     int fd = ::open(host.c_str(), oflags, 0666);
     if (fd < 0) return fail(OpenError(errno, host));
     if (std::uint32_t refusal = RefusalOf(fd, Writing(flags))) {
@@ -114,6 +117,7 @@ bool CFile::Open(const std::string& path, unsigned flags, CFileException* error)
     }
     fd_ = fd;
     path_ = path;
+    newName_ = creating;
     SetLastErrorCode(kErrorSuccess);
     return true;
 }
@@ -177,6 +181,8 @@ std::uint64_t CFile::GetPosition() const {
 void CFile::Flush() {
     if (fd_ < 0) return;
     if (::fsync(fd_) != 0 && errno != EINVAL) Throw(ErrorFromErrno(errno), path_);
+    power::FileFlushed(fd_);
+    if (newName_ && posix::FlushFolder(posix::FolderOf(paths::ToHost(path_)))) newName_ = false;
 }
 
 void CFile::Close() {

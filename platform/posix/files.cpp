@@ -23,6 +23,8 @@
 #include "platform/errors.h"
 #include "platform/fault.h"
 #include "platform/paths.h"
+#include "platform/posix/folder_flush.h"
+#include "platform/power_cut.h"
 
 namespace plat::files {
 
@@ -40,11 +42,8 @@ bool Fail(std::uint32_t code) {
     return false;
 }
 
-std::string Parent(const std::string& host) {
-    const std::size_t slash = host.find_last_of('/');
-    if (slash == std::string::npos) return ".";
-    return slash == 0 ? "/" : host.substr(0, slash);
-}
+using posix::FlushFolder;
+using posix::FolderOf;
 
 std::string BaseName(const std::string& host) {
     const std::size_t slash = host.find_last_of('/');
@@ -59,7 +58,7 @@ bool IsFolder(const std::string& host) {
 // The Windows code for a failed call on host: a missing name is "file not found" when its
 // folder exists and "path not found" when the folder is missing too.
 std::uint32_t CodeFor(int err, const std::string& host) {
-    if (err == ENOENT) return IsFolder(Parent(host)) ? kErrorFileNotFound : kErrorPathNotFound;
+    if (err == ENOENT) return IsFolder(FolderOf(host)) ? kErrorFileNotFound : kErrorPathNotFound;
     if (err == ENOTDIR) return kErrorPathNotFound;
     return ErrorFromErrno(err);
 }
@@ -175,7 +174,7 @@ struct Finish {
 // searches past every file freed in the last minutes whenever it creates one: a run of N
 // groups would cost N squared.
 std::string SpareOf(const std::string& host) {
-    return Parent(host) + "/.pex~" + BaseName(host).substr(0, 64) + ".prev";
+    return FolderOf(host) + "/.pex~" + BaseName(host).substr(0, 64) + ".prev";
 }
 
 // Opens the spare of host for writing; -1 when there is none that may be reused (it must be a
@@ -198,6 +197,7 @@ bool FillAndFlush(int fd, const std::function<bool(int)>& fill, const Finish& fi
     bool ok = fill(fd) && fchmod(fd, finish.mode & 07777) == 0 &&
               (!finish.times || futimens(fd, finish.times) == 0) && fsync(fd) == 0;
     *err = errno;
+    if (ok) power::FileFlushed(fd);
     if (close(fd) != 0 && ok) {
         ok = false;
         *err = errno;
@@ -207,13 +207,17 @@ bool FillAndFlush(int fd, const std::function<bool(int)>& fill, const Finish& fi
 
 // Puts the flushed file at from in target's place in one step. With keepSpare the two names
 // are exchanged and the replaced version becomes target's spare; where the file system cannot
-// exchange names, or target does not exist yet, it is a plain rename.
+// exchange names, or target does not exist yet, it is a plain rename. The folder is flushed, so
+// that the new bytes keep the name after a power cut; a failed folder flush cannot undo the
+// replacement any more, and is left for the next flush of the folder to make good.
 bool TakeTargetName(const std::string& from, const std::string& target, bool keepSpare) {
     if (keepSpare && renameat2(AT_FDCWD, from.c_str(), AT_FDCWD, target.c_str(), RENAME_EXCHANGE) == 0) {
         if (rename(from.c_str(), SpareOf(target).c_str()) != 0) unlink(from.c_str());
-        return true;
+    } else if (rename(from.c_str(), target.c_str()) != 0) {
+        return false;
     }
-    return rename(from.c_str(), target.c_str()) == 0;
+    FlushFolder(FolderOf(target));
+    return true;
 }
 
 // Fills a temporary file beside target, flushes it to the disk and renames it over target, so
@@ -222,7 +226,7 @@ bool TakeTargetName(const std::string& from, const std::string& target, bool kee
 bool ReplaceAtomically(const std::string& target, const std::function<bool(int)>& fill,
                        const Finish& finish) {
     // The name is cut so that a long target name still leaves room for the temporary one.
-    std::string temp = Parent(target) + "/.pex~" + BaseName(target).substr(0, 64) + ".XXXXXX";
+    std::string temp = FolderOf(target) + "/.pex~" + BaseName(target).substr(0, 64) + ".XXXXXX";
     const int fd = mkostemp(temp.data(), O_CLOEXEC);
     if (fd < 0) return FailErrno(target);
     int err = 0;
@@ -258,6 +262,7 @@ bool ReplaceThroughSpare(const std::string& target, int fd, const std::function<
         ok = false;
         err = errno;
     }
+    if (ok) FlushFolder(FolderOf(target));  // as TakeTargetName
     // Whatever failed, target is untouched and the spare holds nothing anybody needs.
     return ok || Fail(CodeFor(err, target));
 }
@@ -269,7 +274,7 @@ bool CheckTarget(const std::string& host, bool failIfExists, bool* exists, struc
     if (!*exists) {
         const int err = errno;
         if (err != ENOENT) return Fail(CodeFor(err, host));
-        return IsFolder(Parent(host)) || Fail(kErrorPathNotFound);
+        return IsFolder(FolderOf(host)) || Fail(kErrorPathNotFound);
     }
     if (failIfExists) return Fail(kErrorFileExists);
     return MayReplace(host, *st);
@@ -363,9 +368,7 @@ bool LinkToKeep(const std::string& from, const std::string& to) {
     if (link(from.c_str(), to.c_str()) != 0) return false;
     // The new name must be on the disk before the caller replaces the source: without a journal
     // nothing else orders the two.
-    const int folder = open(Parent(to).c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
-    const bool durable = folder >= 0 && fsync(folder) == 0;
-    if (folder >= 0) close(folder);
+    const bool durable = FlushFolder(FolderOf(to));
     if (!durable) unlink(to.c_str());
     return durable;
 }
@@ -404,10 +407,13 @@ bool Rename(const std::string& from, const std::string& to, bool replace) {
     if (lstat(b.c_str(), &target) == 0) {
         if (!replace) return Fail(kErrorAlreadyExists);
         if (!MayReplace(b, target)) return false;
-    } else if (!IsFolder(Parent(b))) {
+    } else if (!IsFolder(FolderOf(b))) {
         return Fail(kErrorPathNotFound);
     }
     if (rename(a.c_str(), b.c_str()) != 0) return FailErrno(b);
+    // Written through, as MOVEFILE_WRITE_THROUGH: both names are on the disk when it returns.
+    FlushFolder(FolderOf(b));
+    if (FolderOf(a) != FolderOf(b)) FlushFolder(FolderOf(a));
     return true;
 }
 
@@ -420,6 +426,9 @@ bool Remove(const std::string& path) {
     if (!S_ISLNK(st.st_mode) && !MayReplace(host, st)) return false;
     if (unlink(host.c_str()) != 0) return FailErrno(host);
     unlink(SpareOf(host).c_str());  // the previous version of a file that WriteAllDurably kept
+    // A deletion that a later step counts on (a backup gone before the journal that names it)
+    // must not come back after a power cut.
+    FlushFolder(FolderOf(host));
     return true;
 }
 
@@ -480,7 +489,10 @@ bool MakeDirectory(const std::string& path) {
     if (!fault::Allow(fault::Op::Write)) return false;
     std::string host;
     if (!HostOf(path, &host)) return false;
-    if (mkdir(host.c_str(), 0777) == 0) return true;
+    if (mkdir(host.c_str(), 0777) == 0) {
+        FlushFolder(FolderOf(host));  // what is then put in the folder needs the folder's name
+        return true;
+    }
     if (errno == EEXIST) return Fail(kErrorAlreadyExists);
     if (errno == ENOENT) return Fail(kErrorPathNotFound);
     return FailErrno(host);

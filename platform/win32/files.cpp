@@ -93,12 +93,32 @@ std::string TempName(const std::string& folder, const std::string& prefix) {
     return std::string();
 }
 
+// CopyFileA leaves the copy in the cache; flushing it makes the bytes, and with NTFS's log the
+// name, survive a power cut, as the emulated machine's copy does. A read-only copy (it keeps the
+// source's attributes) cannot be opened for writing, so the attribute is lifted meanwhile. The
+// copy is in place already, so a failed flush is left for the next one to make good.
+void FlushCopy(const std::string& dst) {
+    const DWORD saved = ::GetLastError();
+    const DWORD attributes = ::GetFileAttributesA(dst.c_str());
+    const bool readOnly = attributes != INVALID_FILE_ATTRIBUTES && (attributes & FILE_ATTRIBUTE_READONLY);
+    if (readOnly) ::SetFileAttributesA(dst.c_str(), attributes & ~DWORD{FILE_ATTRIBUTE_READONLY});
+    {
+        Handle file(::CreateFileA(dst.c_str(), GENERIC_WRITE, FILE_SHARE_READ, nullptr, OPEN_EXISTING,
+                                  FILE_ATTRIBUTE_NORMAL, nullptr));
+        if (file) ::FlushFileBuffers(file.get());
+    }
+    if (readOnly) ::SetFileAttributesA(dst.c_str(), attributes);
+    ::SetLastError(saved);
+}
+
 }  // namespace
 
 bool Copy(const std::string& src, const std::string& dst, bool failIfExists) {
     if (!fault::Allow(fault::Op::Copy)) return false;
     if (!failIfExists && !MayReplace(dst)) return false;
-    return ::CopyFileA(src.c_str(), dst.c_str(), failIfExists ? TRUE : FALSE) != FALSE;
+    if (!::CopyFileA(src.c_str(), dst.c_str(), failIfExists ? TRUE : FALSE)) return false;
+    FlushCopy(dst);
+    return true;
 }
 
 bool CopyToKeep(const std::string& src, const std::string& dst) { return Copy(src, dst, false); }
@@ -106,7 +126,8 @@ bool CopyToKeep(const std::string& src, const std::string& dst) { return Copy(sr
 bool Rename(const std::string& from, const std::string& to, bool replace) {
     if (!fault::Allow(fault::Op::Rename)) return false;
     if (replace && !MayReplace(to)) return false;
-    const DWORD flags = replace ? MOVEFILE_REPLACE_EXISTING : 0;
+    // Written through: the new name is on the disk when the call returns.
+    const DWORD flags = MOVEFILE_WRITE_THROUGH | (replace ? MOVEFILE_REPLACE_EXISTING : 0);
     return ::MoveFileExA(from.c_str(), to.c_str(), flags) != FALSE;
 }
 

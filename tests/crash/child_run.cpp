@@ -11,11 +11,8 @@ namespace pextest {
 
 namespace {
 
-[[noreturn]] void RunAndLeave(int crashAt, int reportFd) {
-    plat::fault::Clear();
-    if (crashAt > 0) plat::fault::CrashAtMutation(crashAt);
-    g_TraceLog.enabled = false;
-    UpdateAll(nullptr);
+[[noreturn]] void RunAndLeave(const std::function<void()>& work, int reportFd) {
+    work();
     const int mutations = plat::fault::MutationCount();
     const bool reported = write(reportFd, &mutations, sizeof mutations) == sizeof mutations;
     // No destructors: the parent's test objects (the machine root among them) are not ours.
@@ -24,7 +21,17 @@ namespace {
 
 }  // namespace
 
-ChildRun RunUpdateInChild(int crashAt) {
+ChildRun RunUpdateInChild(int crashAt, const Interruption& how) {
+    return RunInChild([&] {
+        plat::fault::Clear();
+        if (crashAt > 0 && how.powerCut) plat::fault::PowerCutAtMutation(crashAt, how.keepSeed);
+        else if (crashAt > 0) plat::fault::CrashAtMutation(crashAt);
+        g_TraceLog.enabled = false;
+        UpdateAll(nullptr);
+    });
+}
+
+ChildRun RunInChild(const std::function<void()>& work) {
     ChildRun run;
     int fds[2];
     if (pipe(fds) != 0) {
@@ -34,7 +41,7 @@ ChildRun RunUpdateInChild(int crashAt) {
     const pid_t child = fork();
     if (child == 0) {
         close(fds[0]);
-        RunAndLeave(crashAt, fds[1]);
+        RunAndLeave(work, fds[1]);
     }
     close(fds[1]);
     int mutations = 0;

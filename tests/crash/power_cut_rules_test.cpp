@@ -1,0 +1,156 @@
+// The power-cut model and the platform's flushes, one operation at a time: a forked child makes
+// some changes and the power is cut after them; the machine must then hold exactly what was
+// made durable. The whole-run sweep is power_cut_test.cpp.
+#include <gtest/gtest.h>
+
+#include <fcntl.h>
+#include <unistd.h>
+
+#include <climits>
+#include <functional>
+#include <set>
+
+#include "platform/cfile.h"
+#include "platform/fault.h"
+#include "platform/files.h"
+#include "platform/machine.h"
+#include "platform/paths.h"
+#include "platform/power_cut.h"
+#include "platform/setup_install.h"
+#include "tests/crash/child_run.h"
+#include "tests/support/test_machine.h"
+
+namespace {
+
+namespace files = plat::files;
+
+class PowerCutRules : public ::testing::Test {
+protected:
+    // In a child: the state is kept from now on, the steps run, and the power is cut at the next
+    // mutating operation after them. True when the cut happened.
+    bool CutAfter(const std::function<void()>& steps, unsigned keepSeed = 0) {
+        plat::machine::SetRoot(machine.Root());  // the child must not share the registry connection
+        const pextest::ChildRun run = pextest::RunInChild([&] {
+            plat::fault::Clear();
+            plat::fault::PowerCutAtMutation(INT_MAX, keepSeed);
+            steps();
+            plat::fault::PowerCutAtMutation(plat::fault::MutationCount() + 1, keepSeed);
+            files::Remove("C:\\nothing to remove");
+        });
+        return run.crashed;
+    }
+
+    static void Write(const std::string& path, const std::string& bytes, unsigned mode, bool flush) {
+        plat::CFile file;
+        if (!file.Open(path, mode | plat::CFile::modeWrite | plat::CFile::shareExclusive)) return;
+        file.Write(bytes.data(), static_cast<std::uint32_t>(bytes.size()));
+        if (flush) file.Flush();
+    }
+
+    std::string Host(const std::string& winPath) const { return plat::paths::ToHost(winPath); }
+
+    pextest::TestMachine machine;
+};
+
+TEST_F(PowerCutRules, BytesSurviveTheirFlushAndNamesTheirFolderFlush) {
+    machine.WriteFile("C:\\d\\unflushed.txt", "old");
+    machine.WriteFile("C:\\d\\flushed.txt", "old");
+    machine.WriteFile("C:\\d\\renamed.txt", "old");
+    machine.WriteFile("C:\\f\\other.txt", "other");
+    ASSERT_TRUE(CutAfter([&] {
+        Write("C:\\d\\unflushed.txt", "new", plat::CFile::modeNoTruncate, false);
+        Write("C:\\d\\flushed.txt", "new", plat::CFile::modeNoTruncate, true);
+        // Host calls, which report nothing: the names change but no folder is flushed.
+        rename(Host("C:\\d\\renamed.txt").c_str(), Host("C:\\d\\moved.txt").c_str());
+        const int fd = open(Host("C:\\d\\lost.txt").c_str(), O_WRONLY | O_CREAT, 0644);
+        plat::power::FileFlushed(fd);
+        close(fd);
+        const int empty = open(Host("C:\\f\\empty.txt").c_str(), O_WRONLY | O_CREAT, 0644);
+        if (write(empty, "unflushed", 9) != 9) return;
+        plat::power::FolderFlushed(Host("C:\\f"));  // not the other folder
+        close(empty);
+    }));
+    EXPECT_EQ(machine.ReadFile("C:\\d\\unflushed.txt"), "old");
+    EXPECT_EQ(machine.ReadFile("C:\\d\\flushed.txt"), "new");
+    EXPECT_EQ(machine.ReadFile("C:\\d\\renamed.txt"), "old");
+    EXPECT_FALSE(files::Exists("C:\\d\\moved.txt"));
+    EXPECT_FALSE(files::Exists("C:\\d\\lost.txt"));
+    EXPECT_TRUE(files::Exists("C:\\f\\empty.txt"));
+    EXPECT_EQ(machine.ReadFile("C:\\f\\empty.txt"), "");
+}
+
+// What the platform reports done survives: the copy, the durable write, the rename, the
+// deletion, the second name, the new folder and the file created and flushed through CFile.
+TEST_F(PowerCutRules, WhatThePlatformReportsDoneSurvivesACut) {
+    machine.WriteFile("C:\\d\\source.txt", "source");
+    machine.WriteFile("C:\\d\\rewritten.txt", "old");
+    machine.WriteFile("C:\\d\\gone.txt", "old");
+    machine.WriteFile("C:\\e\\moving.txt", "moving");
+    ASSERT_TRUE(CutAfter([] {
+        // First, so that its folder flush (which it always made) covers none of the others.
+        files::CopyToKeep("C:\\d\\source.txt", "C:\\d\\kept.txt");
+        files::Copy("C:\\d\\source.txt", "C:\\d\\copy.txt", false);
+        files::WriteAllDurably("C:\\d\\rewritten.txt", "new");
+        files::WriteAllDurably("C:\\d\\rewritten.txt", "newer");  // through the kept previous version
+        files::WriteAllDurably("C:\\d\\rewritten.txt", "newest");
+        files::WriteAllDurably("C:\\d\\written.txt", "new");
+        files::Rename("C:\\e\\moving.txt", "C:\\d\\moved.txt", false);
+        files::Remove("C:\\d\\gone.txt");
+        files::MakeDirectory("C:\\d\\sub");
+        files::Copy("C:\\d\\source.txt", "C:\\d\\sub\\copy.txt", false);
+        Write("C:\\d\\created.txt", "created", plat::CFile::modeCreate, true);
+    }));
+    EXPECT_EQ(machine.ReadFile("C:\\d\\copy.txt"), "source");
+    EXPECT_EQ(machine.ReadFile("C:\\d\\rewritten.txt"), "newest");
+    EXPECT_EQ(machine.ReadFile("C:\\d\\written.txt"), "new");
+    EXPECT_EQ(machine.ReadFile("C:\\d\\moved.txt"), "moving");
+    EXPECT_FALSE(files::Exists("C:\\e\\moving.txt"));
+    EXPECT_FALSE(files::Exists("C:\\d\\gone.txt"));
+    EXPECT_EQ(machine.ReadFile("C:\\d\\kept.txt"), "source");
+    EXPECT_EQ(machine.ReadFile("C:\\d\\sub\\copy.txt"), "source");
+    EXPECT_EQ(machine.ReadFile("C:\\d\\created.txt"), "created");
+}
+
+// A file staged for the restart is whole on the disk before the queue names it.
+TEST_F(PowerCutRules, AFileStagedForTheRestartSurvivesWithTheQueue) {
+    machine.WriteFile("C:\\d\\new.dll", "version 2");
+    machine.WriteFile("C:\\d\\busy.dll", "version 1");
+    ASSERT_TRUE(CutAfter([] {
+        plat::CFile holder;  // the target in use
+        holder.Open("C:\\d\\busy.dll", plat::CFile::modeRead | plat::CFile::shareExclusive);
+        bool inUse = false;
+        plat::setup::InstallFile("C:\\d\\new.dll", "C:\\d\\busy.dll",
+                                 plat::setup::kCopySourceAbsolute | plat::setup::kCopyInUseNeedsReboot, &inUse);
+    }));
+    std::vector<plat::setup::PendingRename> queue;
+    ASSERT_TRUE(plat::setup::ReadPendingRenames(&queue));
+    ASSERT_EQ(queue.size(), 1u);
+    EXPECT_EQ(machine.ReadFile(queue[0].from), "version 2");
+}
+
+// A seed keeps each unflushed change whole or not at all, the same ones each time.
+TEST_F(PowerCutRules, ASeedKeepsTheSameSubsetOfTheUnflushedChanges) {
+    static constexpr int kFiles = 12;
+    for (int i = 0; i < kFiles; ++i) machine.WriteFile("C:\\d\\" + std::to_string(i), "old");
+    auto outcome = [&](unsigned seed) {
+        std::string kept;
+        for (int i = 0; i < kFiles; ++i) machine.WriteFile("C:\\d\\" + std::to_string(i), "old");
+        EXPECT_TRUE(CutAfter([] {
+            for (int i = 0; i < kFiles; ++i)
+                Write("C:\\d\\" + std::to_string(i), "new bytes", plat::CFile::modeNoTruncate, false);
+        }, seed));
+        for (int i = 0; i < kFiles; ++i) {
+            const std::string bytes = machine.ReadFile("C:\\d\\" + std::to_string(i));
+            EXPECT_TRUE(bytes == "old" || bytes == "new bytes") << bytes;
+            kept += bytes == "old" ? '-' : '+';
+        }
+        return kept;
+    };
+    const std::string first = outcome(7);
+    EXPECT_EQ(outcome(7), first);
+    EXPECT_NE(first.find('+'), std::string::npos) << first;
+    EXPECT_NE(first.find('-'), std::string::npos) << first;
+    EXPECT_EQ(outcome(0), std::string(kFiles, '-'));
+}
+
+}  // namespace
