@@ -7,7 +7,10 @@
 #   ./run.sh bench  build with optimisation into build-bench/, run every benchmark, write
 #                   docs/performance.md and its plots (not in CI; about 7 minutes on 2 cores)
 #   ./run.sh windows   install mingw-w64 and Wine, cross-build for Windows x64 into build-win/,
-#                      run every test program under Wine in a throw-away prefix
+#                      run every test program under Wine in a throw-away prefix, then the ZIP
+#                      package of that build unpacked and run there
+#   ./run.sh package   Release builds for Linux and Windows x64, their packages in dist/, each
+#                      unpacked into an empty folder and run there (the ZIP under Wine)
 # Both are idempotent and quick when nothing changed.
 set -euo pipefail
 cd "$(dirname "$0")"
@@ -105,13 +108,8 @@ run_wine_test() {
   fi
 }
 
-cmd_windows() {
-  install_missing "${WINDOWS_PACKAGES[@]}"
-  [ -f "$WINDOWS_BUILD/CMakeCache.txt" ] ||
-    cmake -S . -B "$WINDOWS_BUILD" -DCMAKE_TOOLCHAIN_FILE=cmake/mingw-w64-x86_64.cmake \
-          -DCMAKE_BUILD_TYPE=Debug >/dev/null
-  cmake --build "$WINDOWS_BUILD" -j"$(nproc)"
-
+# A throw-away Wine prefix for the rest of the script, removed when it ends.
+start_wine_prefix() {
   WINEPREFIX=$(mktemp -d /tmp/pex-wine.XXXXXX)
   export WINEPREFIX WINEDEBUG=-all
   trap 'wineserver -k >/dev/null 2>&1 || true; rm -rf "$WINEPREFIX"' EXIT
@@ -120,15 +118,73 @@ cmd_windows() {
   # prefix's services start here, apart from the tests, whose output pipes they would keep open.
   wineserver -p </dev/null >/dev/null 2>&1
   wine wineboot -i </dev/null >/dev/null 2>&1
+}
+
+# Makes the packages of a build folder in FOLDER/packages.
+make_packages() {
+  rm -rf "$1/packages"
+  cpack --config "$1/CPackConfig.cmake" -B "$1/packages" >/dev/null
+}
+
+# Unpacks each package into an empty folder and runs it there, with the C host program of docs/.
+test_packages() {
+  local host=$1
+  shift
+  bash tests/package/unpacked_package_test.sh "$host" "$@"
+}
+
+cmd_windows() {
+  install_missing "${WINDOWS_PACKAGES[@]}"
+  [ -f "$WINDOWS_BUILD/CMakeCache.txt" ] ||
+    cmake -S . -B "$WINDOWS_BUILD" -DCMAKE_TOOLCHAIN_FILE=cmake/mingw-w64-x86_64.cmake \
+          -DCMAKE_BUILD_TYPE=Debug >/dev/null
+  cmake --build "$WINDOWS_BUILD" -j"$(nproc)"
+
+  start_wine_prefix
   WINE_PASSED=0 WINE_SKIPPED=0 WINE_FAILED=0
   local program failures=0 started=$SECONDS
   while read -r program; do
     [ -n "$program" ] || continue
     run_wine_test "$program" || failures=$((failures + 1))
   done <"$WINDOWS_BUILD/wine-tests.txt"
+  # Last, as it leaves the demo's products on the prefix's machine.
+  make_packages "$WINDOWS_BUILD"
+  test_packages "$WINDOWS_BUILD/bin/host_example.exe" "$WINDOWS_BUILD"/packages/*.zip || failures=$((failures + 1))
   echo "Total under Wine: $WINE_PASSED passed, $WINE_SKIPPED skipped, $WINE_FAILED failed;" \
        "$failures program(s) with failures; $((SECONDS - started))s under Wine"
   ((failures == 0))
+}
+
+# The release packages: Release builds without the tests, for Linux and for Windows x64, packed by
+# CPack and copied to dist/; then each is unpacked into an empty folder and run there (the ZIP
+# under Wine).
+PACKAGE_BUILD=build-release
+WINDOWS_PACKAGE_BUILD=build-win-release
+DIST=dist
+
+release_build() {
+  local folder=$1
+  shift
+  [ -f "$folder/CMakeCache.txt" ] ||
+    cmake -S . -B "$folder" -DCMAKE_BUILD_TYPE=Release -DPEX_TESTS=OFF "$@" >/dev/null
+  cmake --build "$folder" -j"$(nproc)"
+  make_packages "$folder"
+}
+
+cmd_package() {
+  install_missing "${PACKAGES[@]}" "${WINDOWS_PACKAGES[@]}" dpkg-dev
+  timed "Linux release build and packages" release_build "$PACKAGE_BUILD"
+  timed "Windows release build and package" release_build "$WINDOWS_PACKAGE_BUILD" \
+    -DCMAKE_TOOLCHAIN_FILE=cmake/mingw-w64-x86_64.cmake
+  rm -rf "$DIST"
+  mkdir "$DIST"
+  cp "$PACKAGE_BUILD"/packages/*.tar.gz "$PACKAGE_BUILD"/packages/*.deb \
+     "$WINDOWS_PACKAGE_BUILD"/packages/*.zip "$DIST/"
+  test_packages "$PACKAGE_BUILD/bin/host_example" "$DIST"/*.tar.gz "$DIST"/*.deb
+  start_wine_prefix
+  test_packages "$WINDOWS_PACKAGE_BUILD/bin/host_example.exe" "$DIST"/*.zip
+  echo "Packages in $DIST/:"
+  ls -l "$DIST"
 }
 
 # The benchmarks build apart from the tests, optimised; the report needs gnuplot and python3.
@@ -151,5 +207,6 @@ case "${1:-}" in
   demo) cmd_demo ;;
   fuzz) shift; bash fuzz/run.sh "$@" ;;
   bench) cmd_bench ;;
-  *) echo "usage: ./run.sh test | demo | windows | fuzz [SECONDS] | bench" >&2; exit 2 ;;
+  package) cmd_package ;;
+  *) echo "usage: ./run.sh test | demo | windows | package | fuzz [SECONDS] | bench" >&2; exit 2 ;;
 esac
