@@ -95,43 +95,43 @@ static bool MENDLER_CALL ShowProgress(CProgressData* progress) {
 }
 
 #ifdef _WIN32
-static void* LoadModule(const char* path) { return (void*)LoadLibraryA(path); }
-static void* FindFunction(void* module, const char* name) {
+static void* OpenLibrary(const char* path) { return (void*)LoadLibraryA(path); }
+static void* FindExport(void* module, const char* name) {
     return (void*)GetProcAddress((HMODULE)module, name);
 }
-static void FreeModule(void* module) { FreeLibrary((HMODULE)module); }
-static const char* LastLoadError(void) {
+static void CloseLibrary(void* module) { FreeLibrary((HMODULE)module); }
+static const char* LibraryError(void) {
     static char text[32];
     snprintf(text, sizeof text, "error %lu", (unsigned long)GetLastError());
     return text;
 }
 #define DEFAULT_LIBRARY "Mendler.dll"
 #else
-static void* LoadModule(const char* path) { return dlopen(path, RTLD_NOW | RTLD_LOCAL); }
-static void* FindFunction(void* module, const char* name) { return dlsym(module, name); }
-static void FreeModule(void* module) { dlclose(module); }
-static const char* LastLoadError(void) { return dlerror(); }
+static void* OpenLibrary(const char* path) { return dlopen(path, RTLD_NOW | RTLD_LOCAL); }
+static void* FindExport(void* module, const char* name) { return dlsym(module, name); }
+static void CloseLibrary(void* module) { dlclose(module); }
+static const char* LibraryError(void) { return dlerror(); }
 #define DEFAULT_LIBRARY "./Mendler.dll"
 #endif
 
 int main(int argc, char** argv) {
     const char* path = argc > 1 ? argv[1] : DEFAULT_LIBRARY;
-    void* module = LoadModule(path);
+    void* module = OpenLibrary(path);
     if (!module) {
-        fprintf(stderr, "host_example: cannot load %s: %s\n", path, LastLoadError());
+        fprintf(stderr, "host_example: cannot load %s: %s\n", path, LibraryError());
         return 1;
     }
     /* A function pointer from a data pointer: what POSIX and Windows both allow. */
     UpdateAllFunction updateAll;
-    void* found = FindFunction(module, "UpdateAll");
+    void* found = FindExport(module, "UpdateAll");
     memcpy(&updateAll, &found, sizeof updateAll);
     if (!found) {
         fprintf(stderr, "host_example: %s does not export UpdateAll\n", path);
-        FreeModule(module);
+        CloseLibrary(module);
         return 1;
     }
     bool result = updateAll(ShowProgress);
     printf("UpdateAll returned %s\n", result ? "true" : "false");
-    FreeModule(module); /* closes the trace log */
+    CloseLibrary(module); /* closes the trace log */
     return 0;
 }
