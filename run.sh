@@ -16,7 +16,7 @@ set -euo pipefail
 cd "$(dirname "$0")"
 
 PACKAGES=(cmake make g++ pkg-config libgtest-dev libgmock-dev libsqlite3-dev zlib1g-dev flex bison
-          mscompress libmspack-dev libssl-dev nlohmann-json3-dev)
+          mscompress libmspack-dev libssl-dev nlohmann-json3-dev dpkg-dev)
 BUILD=build
 
 install_missing() {
@@ -172,7 +172,7 @@ release_build() {
 }
 
 cmd_package() {
-  install_missing "${PACKAGES[@]}" "${WINDOWS_PACKAGES[@]}" dpkg-dev
+  install_missing "${PACKAGES[@]}" "${WINDOWS_PACKAGES[@]}"
   timed "Linux release build and packages" release_build "$PACKAGE_BUILD"
   timed "Windows release build and package" release_build "$WINDOWS_PACKAGE_BUILD" \
     -DCMAKE_TOOLCHAIN_FILE=cmake/mingw-w64-x86_64.cmake
