@@ -126,12 +126,9 @@ make_packages() {
   cpack --config "$1/CPackConfig.cmake" -B "$1/packages" >/dev/null
 }
 
-# Unpacks each package into an empty folder and runs it there, with the C host program of docs/.
-test_packages() {
-  local host=$1
-  shift
-  bash tests/package/unpacked_package_test.sh "$host" "$@"
-}
+# Unpacks each package into an empty folder and runs it there, with the C host program of docs/:
+#   bash $PACKAGE_TEST HOST-PROGRAM PACKAGE...
+PACKAGE_TEST=tests/package/unpacked_package_test.sh
 
 cmd_windows() {
   install_missing "${WINDOWS_PACKAGES[@]}"
@@ -148,8 +145,9 @@ cmd_windows() {
     run_wine_test "$program" || failures=$((failures + 1))
   done <"$WINDOWS_BUILD/wine-tests.txt"
   # Last, as it leaves the demo's products on the prefix's machine.
-  make_packages "$WINDOWS_BUILD"
-  test_packages "$WINDOWS_BUILD/bin/host_example.exe" "$WINDOWS_BUILD"/packages/*.zip || failures=$((failures + 1))
+  make_packages "$WINDOWS_BUILD" &&
+    bash "$PACKAGE_TEST" "$WINDOWS_BUILD/bin/host_example.exe" "$WINDOWS_BUILD"/packages/*.zip ||
+    failures=$((failures + 1))
   echo "Total under Wine: $WINE_PASSED passed, $WINE_SKIPPED skipped, $WINE_FAILED failed;" \
        "$failures program(s) with failures; $((SECONDS - started))s under Wine"
   ((failures == 0))
@@ -180,9 +178,9 @@ cmd_package() {
   mkdir "$DIST"
   cp "$PACKAGE_BUILD"/packages/*.tar.gz "$PACKAGE_BUILD"/packages/*.deb \
      "$WINDOWS_PACKAGE_BUILD"/packages/*.zip "$DIST/"
-  test_packages "$PACKAGE_BUILD/bin/host_example" "$DIST"/*.tar.gz "$DIST"/*.deb
+  bash "$PACKAGE_TEST" "$PACKAGE_BUILD/bin/host_example" "$DIST"/*.tar.gz "$DIST"/*.deb
   start_wine_prefix
-  test_packages "$WINDOWS_PACKAGE_BUILD/bin/host_example.exe" "$DIST"/*.zip
+  bash "$PACKAGE_TEST" "$WINDOWS_PACKAGE_BUILD/bin/host_example.exe" "$DIST"/*.zip
   echo "Packages in $DIST/:"
   ls -l "$DIST"
 }
