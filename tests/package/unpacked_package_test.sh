@@ -38,6 +38,17 @@ fresh_machine() {
   bash "$make_machine" "$c" "${pex[@]}"
 }
 
+# The host program, beside the library, on the machine.
+run_host() {
+  local name
+  name="./$(basename "$host")"
+  if [ "$wine" ]; then
+    (cd "$dir" && wine "$name" "$@" 2>&1 | tr -d '\r'; exit "${PIPESTATUS[0]}")
+  else
+    (cd "$dir" && PEX_MACHINE="$work/machine" "$name" "$@" 2>&1)
+  fi
+}
+
 first_line() { head -1 "$c/Program Files/Vantric/$1" 2>/dev/null | tr -d '\r'; }
 
 # What `pexupdate all` leaves on the demo's machine (see the README's demo).
@@ -74,15 +85,15 @@ for package in "$@"; do
   fresh_machine
   cp "$host" "$dir/"
   rm -f "$dir/log/pex_support_mendler.log"
-  if [ "$wine" ]; then
-    out=$(cd "$dir" && wine "./$(basename "$host")" 2>&1 | tr -d '\r') || fail "host program: $out"
-  else
-    out=$(cd "$dir" && PEX_MACHINE="$work/machine" "./$(basename "$host")" 2>&1) || fail "host program: $out"
-  fi
+  out=$(run_host) || fail "host program: $out"
   check_products "host program"
   for line in "3 product(s) registered" "product 3 of 3, step 7 of 7: Finished." "UpdateAll returned false"; do
     grep -qxF "$line" <<<"$out" || fail "host program did not print \"$line\""
   done
+  # A library without the export: the host says so and fails.
+  if out=$(run_host ./Rivzip.dll) || ! grep -q "does not export UpdateAll" <<<"$out"; then
+    fail "host program given Rivzip.dll: $out"
+  fi
 done
 ((failures == 0)) && echo "every package runs unpacked"
 ((failures == 0))
