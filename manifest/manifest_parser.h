@@ -102,7 +102,8 @@ private:
     // names it, checked against the loaded table (none when it did not load). The number of rows
     // that could not be recovered: each counts as a failure and is not applied by this run.
     std::uint32_t RecoverEarlierRun(const CContentTable* table);
-    void CleanUpFile(CFile_& file, bool* cleaned);
+    // *cleanedRows gets the row when its clean-up is done.
+    void CleanUpFile(CFile_& file, bool* cleaned, std::vector<std::uint32_t>* cleanedRows);
 
     std::set<std::string> specialFiles_;
     bool specialFileAttempted_ = false;
