@@ -97,7 +97,7 @@ void CRunJournal::Fold(std::uint32_t row, const Record& record) {
     }
 }
 
-bool CRunJournal::Append(const std::vector<Entry>& entries) {
+bool CRunJournal::Append(const std::vector<Entry>& entries, bool flush) {
     if (path_.empty() || entries.empty()) return true;  // no content file, nothing to recover for
     std::string lines;
     for (const Entry& entry : entries) lines += Line(entry.first, entry.second);
@@ -112,7 +112,7 @@ bool CRunJournal::Append(const std::vector<Entry>& entries) {
             file_ = std::move(file);
         }
         file_->Write(lines.data(), static_cast<std::uint32_t>(lines.size()));
-        file_->Flush();
+        if (flush) file_->Flush();
     } catch (const plat::CFileException& error) {
         TRACE(g_TraceLog, "CRunJournal: unable to write to '%s', error code is %d; the step is not taken",
               path_.c_str(), static_cast<int>(error.OsError()));
@@ -152,11 +152,11 @@ std::vector<CRunJournal::Entry> CRunJournal::Marks(const std::vector<std::uint32
     return entries;
 }
 
-bool CRunJournal::RecordCommitted(const std::vector<std::uint32_t>& rows) { return Append(Marks(rows, 'C')); }
+bool CRunJournal::RecordCommitted(const std::vector<std::uint32_t>& rows) { return Append(Marks(rows, 'C'), false); }
 
 bool CRunJournal::RecordUndone(std::uint32_t row) { return !IsPending(row) || Append(row, Record{'U', {}}); }
 
-bool CRunJournal::RecordCleaned(const std::vector<std::uint32_t>& rows) { return Append(Marks(rows, 'K')); }
+bool CRunJournal::RecordCleaned(const std::vector<std::uint32_t>& rows) { return Append(Marks(rows, 'K'), false); }
 
 bool CRunJournal::Discard() {
     pending_.clear();

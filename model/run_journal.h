@@ -8,10 +8,12 @@
 // announces begins; records written together go out with one flush:
 //   - a target that is backed up has its B and its R record written together, before the
 //     backup: a backup is made whole or not at all (a second name of the target, or a copy
-//     renamed into place), and an R whose backup does not exist finds the target untouched;
-//   - the C records of a group, after the content file that commits them was saved;
-//   - the K records of a clean-up, after the deletions they report were made durable (their
-//     folders flushed): a K that survives a power cut never hides a file that came back.
+//     renamed into place), and an R whose backup does not exist finds the target untouched.
+// C and K records announce no step and are not flushed (the next flush of the journal carries
+// them): without its C record a row is still found committed by the content file, saved and
+// flushed before the C records are written; without its K record a row's clean-up is done once
+// more, which finds nothing left to remove. The K records of a clean-up are written after its
+// deletions were made durable (their folders flushed), so a K never hides a file that came back.
 //   B|row|download|target|backup|attributes|created|accessed|written
 //                                  the target is about to be backed up under backup; the
 //                                  attributes and times it has (hexadecimal), to give back
@@ -78,8 +80,8 @@ public:
     // True when the row waits for the recovery of an earlier run.
     bool IsPending(std::uint32_t row) const;
 
-    // The records, flushed before it returns. False, with a trace line, when they could not be
-    // written: the step they announce must not happen.
+    // The records, flushed before it returns (but C and K). False, with a trace line, when they
+    // could not be written: the step they announce must not happen.
     // B and R together: target is about to be backed up under backup, then replaced.
     bool RecordBackupAndReplace(std::uint32_t row, const std::string& download, const std::string& target,
                                 const std::string& backup, const plat::files::FileStatus& before);
@@ -115,7 +117,7 @@ public:
 private:
     using Entry = std::pair<std::uint32_t, Record>;
     bool Append(std::uint32_t row, const Record& record) { return Append({Entry{row, record}}); }
-    bool Append(const std::vector<Entry>& entries);  // one write, one flush
+    bool Append(const std::vector<Entry>& entries, bool flush = true);  // one write, one flush
     std::vector<Entry> Marks(const std::vector<std::uint32_t>& rows, char kind) const;
     void Fold(std::uint32_t row, const Record& record);
     bool RecoverRow(std::uint32_t row, const CommittedTest& committed);
