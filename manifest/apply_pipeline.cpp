@@ -139,47 +139,14 @@ void CManifestParser::ApplyGroups(std::int32_t& result, ProgressCallback callbac
 
 void CManifestParser::ApplyGroup(CFileGroup& group, std::int32_t& result, ProgressCallback callback) {
     TRACE(g_TraceLog, "CManifestParser: Dependancies are applied");
-    bool groupError = false;
     std::vector<std::uint32_t> appliedRows;  // rows marked applied by this attempt
+    bool groupError = false;
     {
         // The copies' folders are flushed once each when the batch ends, before a rollback or the
         // save that commits them.
         plat::files::FolderFlushBatch copies;
-        for (CFile_& file : group.GetFiles()) {
-            const std::string fileName = file.GetFileName();
-            const auto row = static_cast<std::int32_t>(file.GetRow());
-            TRACE(g_TraceLog, "CManifestParser: considering applying file '%s'", fileName.c_str());
-            if (mandatoryOnly_ && !file.IsMandatory()) {
-                TRACE(g_TraceLog, "CManifestParser: not applying file, not part of this package");
-                continue;
-            }
-            if (file.IsApplied()) {
-                TRACE(g_TraceLog, "CManifestParser: file already applied");
-                continue;
-            }
-            TRACE(g_TraceLog, "CManifestParser: file not applied yet");
-            if (!file.IsDownloaded()) {
-                TRACE(g_TraceLog, "CManifestParser: File isn't downloaded properly, not applying");
-                continue;
-            }
-            Report(callback, "Applying " + fileName);
-            const std::int32_t applied = file.Apply();
-            if (applied == CFile_::kApplied) {
-                TRACE(g_TraceLog, "CManifestParser: file '%s' applied", fileName.c_str());
-                SetField(row, "UpgradeStatus", UpgradeStatus[kAppliedSuccessfully]);
-                appliedRows.push_back(file.GetRow());
-                Step(callback);
-                continue;
-            }
-            if (applied == CFile_::kCommandsFailed)
-                TRACE(g_TraceLog, "CManifestParser: error running install commands for ( '%s' )", fileName.c_str());
-            else
-                TRACE(g_TraceLog, "CManifestParser: file '%s' not applied", fileName.c_str());
-            SetField(row, "UpgradeStatus", UpgradeStatus[kApplicationFailed]);
-            ++result;
-            groupError = true;
-            break;
-        }
+        for (CFile_& file : group.GetFiles())
+            if ((groupError = !ApplyMember(file, result, callback, &appliedRows))) break;
     }
     if (groupError) {
         TRACE(g_TraceLog, "CManifestParser: Error detected applying a member of a file group, rolling back group.");
@@ -196,6 +163,43 @@ void CManifestParser::ApplyGroup(CFileGroup& group, std::int32_t& result, Progre
     // ends in between is told by the content file (RecoverEarlierRun).
     if (WriteManifest() && !groupError) journal_.RecordCommitted(appliedRows);
     TRACE(g_TraceLog, "CManifestParser: b.o.l., Manifest written");
+}
+
+// One file of a group whose dependencies are applied; false when it failed (the group error).
+bool CManifestParser::ApplyMember(CFile_& file, std::int32_t& result, ProgressCallback callback,
+                                  std::vector<std::uint32_t>* appliedRows) {
+    const std::string fileName = file.GetFileName();
+    const auto row = static_cast<std::int32_t>(file.GetRow());
+    TRACE(g_TraceLog, "CManifestParser: considering applying file '%s'", fileName.c_str());
+    if (mandatoryOnly_ && !file.IsMandatory()) {
+        TRACE(g_TraceLog, "CManifestParser: not applying file, not part of this package");
+        return true;
+    }
+    if (file.IsApplied()) {
+        TRACE(g_TraceLog, "CManifestParser: file already applied");
+        return true;
+    }
+    TRACE(g_TraceLog, "CManifestParser: file not applied yet");
+    if (!file.IsDownloaded()) {
+        TRACE(g_TraceLog, "CManifestParser: File isn't downloaded properly, not applying");
+        return true;
+    }
+    Report(callback, "Applying " + fileName);
+    const std::int32_t applied = file.Apply();
+    if (applied == CFile_::kApplied) {
+        TRACE(g_TraceLog, "CManifestParser: file '%s' applied", fileName.c_str());
+        SetField(row, "UpgradeStatus", UpgradeStatus[kAppliedSuccessfully]);
+        appliedRows->push_back(file.GetRow());
+        Step(callback);
+        return true;
+    }
+    if (applied == CFile_::kCommandsFailed)
+        TRACE(g_TraceLog, "CManifestParser: error running install commands for ( '%s' )", fileName.c_str());
+    else
+        TRACE(g_TraceLog, "CManifestParser: file '%s' not applied", fileName.c_str());
+    SetField(row, "UpgradeStatus", UpgradeStatus[kApplicationFailed]);
+    ++result;
+    return false;
 }
 
 void CManifestParser::CleanUp(std::int32_t result, ProgressCallback callback) {
