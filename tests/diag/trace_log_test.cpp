@@ -132,9 +132,13 @@ TEST_F(TraceLogTest, FolderMadeAgainInAnotherCaseIsFoundAfterAFailedOpen) {
     EXPECT_EQ(pextest::TraceLines(m.ReadFile("C:\\logs\\run.log")), Lines{"after"});
 }
 
-// Between the lines of a burst the share lock is let go: a reader that denies writers gets in,
-// and the line that meets it is dropped as on Windows.
+// On the emulated machine the share lock is let go between the lines of a burst, as it was
+// before a line held it: a reader that denies writers gets in, and the line that meets it is
+// dropped. Windows refuses that reader while the burst's handle is open for writing.
 TEST_F(TraceLogTest, BurstLetsOtherOpenersInBetweenItsLines) {
+#ifdef _WIN32
+    GTEST_SKIP() << "Windows keeps a deny-write reader out while the log is open for writing";
+#endif
     g_TraceLog.keepOpen = true;
     TRACE(g_TraceLog, "burst 1");
     plat::CFile reader;
