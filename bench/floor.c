@@ -4,7 +4,16 @@
  * and flush it, then copy the download over the target and flush it. Then, as the library's
  * clean-up does, remove every backup and every download. UpdateAll is measured against this.
  *
- *   pexfloor LISTFILE        exit 0 when every step succeeded
+ * The log and the status that the library keeps are part of the work too:
+ *   --log FILE --lines N --line-bytes B   N lines of B bytes appended to FILE, each by open
+ *                                         (append, create), one write and close, spread evenly
+ *                                         over the files (the trace log's least cost)
+ *   --status FILE --status-bytes B --group-files K
+ *                                         after every K files (and after the last), FILE
+ *                                         written whole with B bytes and flushed (the content
+ *                                         file's write-back after every group)
+ *
+ *   pexfloor LISTFILE [OPTIONS]   exit 0 when every step succeeded
  */
 #define _GNU_SOURCE
 #include <errno.h>
@@ -51,6 +60,47 @@ static int CopyAndFlush(const char* from, const char* to) {
     return ok ? 0 : -1;
 }
 
+/* The C loop of a trace line: open for appending, one write, close. */
+static int AppendLine(const char* log, const char* line, size_t size) {
+    int fd = open(log, O_WRONLY | O_APPEND | O_CREAT | O_CLOEXEC, 0644);
+    if (fd < 0) return -1;
+    int ok = write(fd, line, size) == (ssize_t)size;
+    return close(fd) == 0 && ok ? 0 : -1;
+}
+
+static int WriteStatus(const char* status, size_t size) {
+    static char* bytes = NULL;
+    if (!bytes && !(bytes = malloc(size ? size : 1))) return -1;
+    memset(bytes, 'S', size);
+    int fd = open(status, O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0644);
+    if (fd < 0) return -1;
+    int ok = write(fd, bytes, size) == (ssize_t)size && fsync(fd) == 0;
+    return close(fd) == 0 && ok ? 0 : -1;
+}
+
+struct Options {
+    const char* log;
+    long lines, lineBytes;
+    const char* status;
+    long statusBytes, groupFiles;
+};
+
+static int ParseOptions(int argc, char** argv, struct Options* o) {
+    memset(o, 0, sizeof *o);
+    for (int i = 2; i + 1 < argc; i += 2) {
+        const char* name = argv[i];
+        const char* value = argv[i + 1];
+        if (!strcmp(name, "--log")) o->log = value;
+        else if (!strcmp(name, "--lines")) o->lines = atol(value);
+        else if (!strcmp(name, "--line-bytes")) o->lineBytes = atol(value);
+        else if (!strcmp(name, "--status")) o->status = value;
+        else if (!strcmp(name, "--status-bytes")) o->statusBytes = atol(value);
+        else if (!strcmp(name, "--group-files")) o->groupFiles = atol(value);
+        else return -1;
+    }
+    return argc % 2 == 0 ? 0 : -1;
+}
+
 struct Pair {
     char* target;
     char* download;
@@ -58,8 +108,10 @@ struct Pair {
 };
 
 int main(int argc, char** argv) {
-    if (argc != 2) {
-        fprintf(stderr, "usage: pexfloor LISTFILE\n");
+    struct Options options;
+    if (argc < 2 || ParseOptions(argc, argv, &options) != 0) {
+        fprintf(stderr, "usage: pexfloor LISTFILE [--log FILE --lines N --line-bytes B] "
+                        "[--status FILE --status-bytes B --group-files K]\n");
         return 2;
     }
     FILE* list = fopen(argv[1], "r");
@@ -92,7 +144,17 @@ int main(int argc, char** argv) {
 
     int failures = 0;
     char backup[4096];
+    char* logLine = NULL;
+    if (options.log && options.lineBytes > 0) {
+        if (!(logLine = malloc((size_t)options.lineBytes))) return 2;
+        memset(logLine, 'L', (size_t)options.lineBytes);
+        logLine[options.lineBytes - 1] = '\n';
+    }
+    long linesWritten = 0;
     for (size_t i = 0; i < count; ++i) {
+        /* The lines so far in proportion to the files so far. */
+        for (long due = logLine ? options.lines * (long)(i + 1) / (long)count : 0; linesWritten < due; ++linesWritten)
+            if (AppendLine(options.log, logLine, (size_t)options.lineBytes) != 0) ++failures;
         struct stat st;
         snprintf(backup, sizeof backup, "%s.$bak$", pairs[i].target);
         if (stat(pairs[i].target, &st) == 0) {
@@ -103,6 +165,8 @@ int main(int argc, char** argv) {
             pairs[i].backedUp = 1;
         }
         if (CopyAndFlush(pairs[i].download, pairs[i].target) != 0) ++failures;
+        const int groupEnd = options.groupFiles > 0 && ((long)(i + 1) % options.groupFiles == 0 || i + 1 == count);
+        if (options.status && groupEnd && WriteStatus(options.status, (size_t)options.statusBytes) != 0) ++failures;
     }
     for (size_t i = 0; i < count; ++i) {
         snprintf(backup, sizeof backup, "%s.$bak$", pairs[i].target);

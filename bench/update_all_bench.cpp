@@ -19,6 +19,10 @@
 // from a copy of the program folder in which "log" is a plain file, so the library cannot open
 // its log and builds every line without writing it. The difference is what the log's file costs.
 //
+// The floor does the library's specified writes beside the file work: when the run wrote a log,
+// the C loop appends as many lines of the same mean length (open, one write, close each), and
+// the status (the content file's size) is written and flushed after every group.
+//
 // The time of a repetition is the UpdateAll run; the counters carry the floor's time beside it.
 #include <benchmark/benchmark.h>
 #include <fcntl.h>
@@ -161,6 +165,7 @@ public:
                        "," + depends + ",0,,,\r\n";
         }
         WriteHostFile(c + "/Pex/Bench_content.txt", content);
+        contentBytes_ = content.size();
         SetText("ContentFileName", kContent);
         SetText("ContentFileMode", "");
         SetText("ContentFileTarget", "");
@@ -188,10 +193,12 @@ public:
     void Keep() { keep_ = true; }
     const std::string& Root() const { return root_; }
     std::string PairsFile() const { return root_ + "/pairs.txt"; }
+    std::size_t ContentBytes() const { return contentBytes_; }
     std::string DriveC() const { return root_ + "/drive_c"; }
 
 private:
     std::string root_, pairs_;
+    std::size_t contentBytes_ = 0;
     bool keep_ = false;
 };
 
@@ -246,16 +253,44 @@ void ForgetLogs(const std::string& bin) {
     fs::remove(bin + "/log/pex_support_mendler.bak", ec);
 }
 
-// The lines of the log that the last run left (0 without one).
-double LogLines(const std::string& bin) {
+// The lines of the log that the last run left and their bytes (0 without one).
+struct LogSize {
+    double lines = 0, bytes = 0;
+};
+LogSize LogLines(const std::string& bin) {
+    LogSize size;
     const int fd = ::open((bin + "/log/pex_support_mendler.log").c_str(), O_RDONLY | O_CLOEXEC);
-    if (fd < 0) return 0;
-    double lines = 0;
+    if (fd < 0) return size;
     char buffer[1 << 16];
-    for (ssize_t n; (n = ::read(fd, buffer, sizeof buffer)) > 0;)
-        lines += static_cast<double>(std::count(buffer, buffer + n, '\n'));
+    for (ssize_t n; (n = ::read(fd, buffer, sizeof buffer)) > 0;) {
+        size.lines += static_cast<double>(std::count(buffer, buffer + n, '\n'));
+        size.bytes += static_cast<double>(n);
+    }
     ::close(fd);
-    return lines;
+    return size;
+}
+
+// Files per group, for the floor's status writes.
+int GroupFiles(const Scenario& s) {
+    switch (s.grouping) {
+        case Scenario::kOneGroup: return s.files;
+        case Scenario::kGroupsOf100: return 100;
+        default: return 1;
+    }
+}
+
+// The floor's command line: the file work, the log's lines as the run wrote them, the status.
+std::vector<std::string> FloorCommand(const std::string& bin, const Machine& m, const Scenario& s,
+                                      const LogSize& log) {
+    std::vector<std::string> args{bin + "/pexfloor", m.PairsFile(), "--status", m.Root() + "/status.txt",
+                                  "--status-bytes", std::to_string(m.ContentBytes()), "--group-files",
+                                  std::to_string(GroupFiles(s))};
+    if (log.lines > 0) {
+        const auto lines = static_cast<long>(log.lines);
+        args.insert(args.end(), {"--log", m.Root() + "/floor.log", "--lines", std::to_string(lines),
+                                 "--line-bytes", std::to_string(static_cast<long>(log.bytes) / lines)});
+    }
+    return args;
 }
 
 // A complete success: the content file is gone and the targets hold their new bytes.
@@ -281,7 +316,7 @@ void BM_UpdateAll(benchmark::State& state, Scenario scenario) {
     const std::string bin = BinFolder();
     const std::string host = scenario.logFile ? bin : NoLogBinFolder(bin);
     Timing mendler, floor;
-    double lines = 0;
+    LogSize lines;
     for (auto _ : state) {
         {
             Machine m(scenario);
@@ -291,11 +326,11 @@ void BM_UpdateAll(benchmark::State& state, Scenario scenario) {
                 state.SkipWithError("the update run failed");
                 break;
             }
-            lines = scenario.logFile ? LogLines(bin) : 0;
+            lines = scenario.logFile ? LogLines(bin) : LogSize{};
         }
         {
             Machine m(scenario);
-            floor = Run({bin + "/pexfloor", m.PairsFile()});
+            floor = Run(FloorCommand(bin, m, scenario, lines));
             if (floor.seconds < 0) {
                 state.SkipWithError("the floor program failed");
                 break;
@@ -309,7 +344,7 @@ void BM_UpdateAll(benchmark::State& state, Scenario scenario) {
     state.counters["floor_cpu_s"] = floor.cpu;
     state.counters["ratio"] = floor.seconds > 0 ? mendler.seconds / floor.seconds : 0;
     state.counters["files"] = scenario.files;
-    state.counters["log_lines"] = lines;
+    state.counters["log_lines"] = lines.lines;
     state.counters["bytes"] = static_cast<double>(scenario.size) * scenario.files;
 }
 

@@ -6,10 +6,6 @@ namespace {
 
 constexpr std::uint32_t kMutexWaitMs = 500;
 
-constexpr unsigned kOpenFlags = plat::CFile::modeReadWrite | plat::CFile::shareDenyNone |
-                                plat::CFile::modeCreate | plat::CFile::modeNoTruncate |
-                                plat::CFile::typeBinary;
-
 // Holds the mutex for one operation when the wait succeeded.
 class MutexHold {
 public:
@@ -28,62 +24,52 @@ private:
 
 }  // namespace
 
-TraceFile::TraceFile() : file_(std::make_unique<plat::CFile>()) {}
+TraceFile::TraceFile() = default;
 
-TraceFile::~TraceFile() = default;  // the CFile closes its handle
+TraceFile::~TraceFile() = default;  // the AppendFile closes its handle
 
 bool TraceFile::Open(const std::string& name) {
     MutexHold hold(mutex_);
-    return hold.Locked() && file_->Open(name, kOpenFlags);
+    return hold.Locked() && file_.Open(name);
+}
+
+void TraceFile::ForgetMapping() {
+    MutexHold hold(mutex_);
+    if (hold.Locked()) file_.ForgetMapping();
 }
 
 bool TraceFile::Close() {
     MutexHold hold(mutex_);
     if (!hold.Locked()) return false;
-    try {
-        file_->Close();
-    } catch (const plat::CFileException&) {
-        return false;  // the handle is gone even so
-    }
+    file_.Close();
     return true;
 }
 
-bool TraceFile::SeekToEnd() {
-    MutexHold hold(mutex_);
-    if (!hold.Locked() || !file_->IsOpen()) return false;
-    try {
-        file_->Seek(0, plat::CFile::end);
-    } catch (const plat::CFileException&) {
-        return false;
-    }
-    return true;
-}
-
+// The append mode of the file puts every write at its end, so no seek is needed.
 bool TraceFile::Write(const std::string& text) {
     MutexHold hold(mutex_);
-    if (!hold.Locked() || !file_->IsOpen()) return false;
-    auto piece = [this](const char* data, std::size_t size) {
-        if (size > 0) file_->Write(data, static_cast<std::uint32_t>(size));
-    };
-    try {
-        std::size_t start = 0;
-        for (std::size_t lf; (lf = text.find('\n', start)) != std::string::npos; start = lf + 1) {
-            std::size_t end = lf > start && text[lf - 1] == '\r' ? lf - 1 : lf;
-            piece(text.data() + start, end - start);
-            piece("\r\n", 2);
-        }
-        piece(text.data() + start, text.size() - start);
-    } catch (const plat::CFileException&) {
-        return false;
+    if (!hold.Locked() || !file_.IsOpen()) return false;
+    std::string windows;
+    windows.reserve(text.size() + 2);
+    std::size_t start = 0;
+    for (std::size_t lf; (lf = text.find('\n', start)) != std::string::npos; start = lf + 1) {
+        const std::size_t end = lf > start && text[lf - 1] == '\r' ? lf - 1 : lf;
+        windows.append(text, start, end - start).append("\r\n");
     }
-    return true;
+    windows.append(text, start, std::string::npos);
+    return windows.empty() || file_.Append(windows.data(), windows.size());
 }
 
 bool TraceFile::Append(const std::string& text) {
     MutexHold hold(mutex_);
-    return hold.Locked() && SeekToEnd() && Write(text);
+    return hold.Locked() && Write(text);
+}
+
+void TraceFile::Release() {
+    MutexHold hold(mutex_);
+    if (hold.Locked()) file_.Release();
 }
 
 bool TraceFile::IsOpen() const {
-    return file_->IsOpen();
+    return file_.IsOpen();
 }

@@ -19,6 +19,7 @@ TraceLog::TraceLog(const std::string& fileName) {
 
 void TraceLog::SetFileName(const std::string& fileName) {
     fileName_ = fileName;
+    file_.ForgetMapping();  // mapped once per configuration
     openFailed_ = false;
     if (!fileName_.empty()) fileOutput = true;
 }
@@ -100,7 +101,11 @@ std::string TraceLog::BuildLine(const std::string& message) const {
 void TraceLog::Output(const std::string& line) {
     if (fileOutput && !isOpen_) Open();
     if (fileOutput && isOpen_) file_.Append(line);
-    if (!keepOpen) Close();
+    if (!keepOpen) {
+        Close();
+    } else if (isOpen_) {
+        file_.Release();  // other programs may open the log between the lines of a burst
+    }
 }
 
 void TraceLog::Write(const std::string& message) {

@@ -4,12 +4,12 @@
 #include <memory>
 #include <string>
 
-#include "platform/cfile.h"
+#include "platform/append_file.h"
 #include "platform/sync.h"
 
 // The open log file and its mutex. Every file operation waits at most 500 ms for the mutex and
 // does nothing when the wait fails (returning false). The mutex is recursive, so Append may hold
-// it around the seek and the write, which take it again.
+// it around the write, which takes it again.
 class TraceFile {
 public:
     TraceFile();
@@ -17,19 +17,22 @@ public:
     TraceFile(const TraceFile&) = delete;
     TraceFile& operator=(const TraceFile&) = delete;
 
-    // Read/write, shared for reading and writing with other openers, created when missing,
-    // existing content kept. A handle still open is closed first.
+    // Opened for appending, shared for reading and writing with other openers, created when
+    // missing, existing content kept. A handle still open is closed first. The name's host path
+    // is mapped at its first open and kept; only a failed open, or ForgetMapping, maps it again.
     bool Open(const std::string& name);
+    void ForgetMapping();
     bool Close();  // true when no handle is left open
-    bool SeekToEnd();
-    // Writes the text, every line feed not preceded by a carriage return as CR LF, in pieces
-    // (the text up to each line feed, then the line end). Stops at the first failing piece.
+    // Writes the text at the end of the file, every line feed not preceded by a carriage
+    // return as CR LF, in one write: a failed write loses the whole line, never part of it.
     bool Write(const std::string& text);
-    bool Append(const std::string& text);  // seek to end and write, mutex held once for both
+    bool Append(const std::string& text);  // the write, mutex held once around it
+    // Lets other openers' share checks through while the file stays open (keepOpen).
+    void Release();
     bool IsOpen() const;
 
 private:
-    std::unique_ptr<plat::CFile> file_;
+    plat::AppendFile file_;
     plat::TimedMutex mutex_;
 };
 

@@ -139,42 +139,14 @@ void CManifestParser::ApplyGroups(std::int32_t& result, ProgressCallback callbac
 
 void CManifestParser::ApplyGroup(CFileGroup& group, std::int32_t& result, ProgressCallback callback) {
     TRACE(g_TraceLog, "CManifestParser: Dependancies are applied");
-    bool groupError = false;
     std::vector<std::uint32_t> appliedRows;  // rows marked applied by this attempt
-    for (CFile_& file : group.GetFiles()) {
-        const std::string fileName = file.GetFileName();
-        const auto row = static_cast<std::int32_t>(file.GetRow());
-        TRACE(g_TraceLog, "CManifestParser: considering applying file '%s'", fileName.c_str());
-        if (mandatoryOnly_ && !file.IsMandatory()) {
-            TRACE(g_TraceLog, "CManifestParser: not applying file, not part of this package");
-            continue;
-        }
-        if (file.IsApplied()) {
-            TRACE(g_TraceLog, "CManifestParser: file already applied");
-            continue;
-        }
-        TRACE(g_TraceLog, "CManifestParser: file not applied yet");
-        if (!file.IsDownloaded()) {
-            TRACE(g_TraceLog, "CManifestParser: File isn't downloaded properly, not applying");
-            continue;
-        }
-        Report(callback, "Applying " + fileName);
-        const std::int32_t applied = file.Apply();
-        if (applied == CFile_::kApplied) {
-            TRACE(g_TraceLog, "CManifestParser: file '%s' applied", fileName.c_str());
-            SetField(row, "UpgradeStatus", UpgradeStatus[kAppliedSuccessfully]);
-            appliedRows.push_back(file.GetRow());
-            Step(callback);
-            continue;
-        }
-        if (applied == CFile_::kCommandsFailed)
-            TRACE(g_TraceLog, "CManifestParser: error running install commands for ( '%s' )", fileName.c_str());
-        else
-            TRACE(g_TraceLog, "CManifestParser: file '%s' not applied", fileName.c_str());
-        SetField(row, "UpgradeStatus", UpgradeStatus[kApplicationFailed]);
-        ++result;
-        groupError = true;
-        break;
+    bool groupError = false;
+    {
+        // The copies' folders are flushed once each when the batch ends, before a rollback or the
+        // save that commits them.
+        plat::files::FolderFlushBatch copies;
+        for (CFile_& file : group.GetFiles())
+            if ((groupError = !ApplyMember(file, result, callback, &appliedRows))) break;
     }
     if (groupError) {
         TRACE(g_TraceLog, "CManifestParser: Error detected applying a member of a file group, rolling back group.");
@@ -193,6 +165,43 @@ void CManifestParser::ApplyGroup(CFileGroup& group, std::int32_t& result, Progre
     TRACE(g_TraceLog, "CManifestParser: b.o.l., Manifest written");
 }
 
+// One file of a group whose dependencies are applied; false when it failed (the group error).
+bool CManifestParser::ApplyMember(CFile_& file, std::int32_t& result, ProgressCallback callback,
+                                  std::vector<std::uint32_t>* appliedRows) {
+    const std::string fileName = file.GetFileName();
+    const auto row = static_cast<std::int32_t>(file.GetRow());
+    TRACE(g_TraceLog, "CManifestParser: considering applying file '%s'", fileName.c_str());
+    if (mandatoryOnly_ && !file.IsMandatory()) {
+        TRACE(g_TraceLog, "CManifestParser: not applying file, not part of this package");
+        return true;
+    }
+    if (file.IsApplied()) {
+        TRACE(g_TraceLog, "CManifestParser: file already applied");
+        return true;
+    }
+    TRACE(g_TraceLog, "CManifestParser: file not applied yet");
+    if (!file.IsDownloaded()) {
+        TRACE(g_TraceLog, "CManifestParser: File isn't downloaded properly, not applying");
+        return true;
+    }
+    Report(callback, "Applying " + fileName);
+    const std::int32_t applied = file.Apply();
+    if (applied == CFile_::kApplied) {
+        TRACE(g_TraceLog, "CManifestParser: file '%s' applied", fileName.c_str());
+        SetField(row, "UpgradeStatus", UpgradeStatus[kAppliedSuccessfully]);
+        appliedRows->push_back(file.GetRow());
+        Step(callback);
+        return true;
+    }
+    if (applied == CFile_::kCommandsFailed)
+        TRACE(g_TraceLog, "CManifestParser: error running install commands for ( '%s' )", fileName.c_str());
+    else
+        TRACE(g_TraceLog, "CManifestParser: file '%s' not applied", fileName.c_str());
+    SetField(row, "UpgradeStatus", UpgradeStatus[kApplicationFailed]);
+    ++result;
+    return false;
+}
+
 void CManifestParser::CleanUp(std::int32_t result, ProgressCallback callback) {
     if (result == 0) {
         Report(callback, "Cleaning up");
@@ -208,8 +217,15 @@ void CManifestParser::CleanUp(std::int32_t result, ProgressCallback callback) {
     // holds their rows; what is left (a run that ends in here, a deletion that fails) the next
     // run's recovery removes, as the journal names it.
     bool cleaned = true;
-    for (auto& [key, group] : masterList_)
-        for (CFile_& file : group.GetFiles()) CleanUpFile(file, &cleaned);
+    std::vector<std::uint32_t> cleanedRows;
+    {
+        // The deletions' folders are flushed once each, and before the journal is told.
+        plat::files::FolderFlushBatch removals;
+        for (auto& [key, group] : masterList_)
+            for (CFile_& file : group.GetFiles()) CleanUpFile(file, &cleaned, &cleanedRows);
+        removals.Flush();
+    }
+    cleaned = journal_.RecordCleaned(cleanedRows) && cleaned;
     // After a complete clean-up all the journal may still hold are downloads that could not be
     // removed, which no later run would look for once the content file is gone. It goes before
     // the content file (a run that ends in between discards that again), and keeps it while it
@@ -233,7 +249,7 @@ void CManifestParser::CleanUp(std::int32_t result, ProgressCallback callback) {
     Step(callback);
 }
 
-void CManifestParser::CleanUpFile(CFile_& file, bool* cleaned) {
+void CManifestParser::CleanUpFile(CFile_& file, bool* cleaned, std::vector<std::uint32_t>* cleanedRows) {
     TRACE(g_TraceLog, "CManifestParser: ProcessUpdateInformation, removing backup file for '%s'",
           file.GetFileName().c_str());
     const bool noBackup = file.RemoveBackupFile();
@@ -250,7 +266,7 @@ void CManifestParser::CleanUpFile(CFile_& file, bool* cleaned) {
               file.GetDownLoadCacheFile().c_str());
         return;
     }
-    *cleaned = journal_.RecordCleaned(file.GetRow()) && *cleaned;
+    cleanedRows->push_back(file.GetRow());
 }
 
 std::uint32_t CManifestParser::RecoverEarlierRun(const CContentTable* table) {

@@ -97,12 +97,15 @@ private:
     void DecompressFiles(std::int32_t& result, ProgressCallback callback);
     void ApplyGroups(std::int32_t& result, ProgressCallback callback);
     void ApplyGroup(CFileGroup& group, std::int32_t& result, ProgressCallback callback);
+    bool ApplyMember(CFile_& file, std::int32_t& result, ProgressCallback callback,
+                     std::vector<std::uint32_t>* appliedRows);
     void CleanUp(std::int32_t result, ProgressCallback callback);
     // Finishes or undoes what an interrupted earlier run of the product left, as its journal
     // names it, checked against the loaded table (none when it did not load). The number of rows
     // that could not be recovered: each counts as a failure and is not applied by this run.
     std::uint32_t RecoverEarlierRun(const CContentTable* table);
-    void CleanUpFile(CFile_& file, bool* cleaned);
+    // *cleanedRows gets the row when its clean-up is done.
+    void CleanUpFile(CFile_& file, bool* cleaned, std::vector<std::uint32_t>* cleanedRows);
 
     std::set<std::string> specialFiles_;
     bool specialFileAttempted_ = false;

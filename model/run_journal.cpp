@@ -97,9 +97,10 @@ void CRunJournal::Fold(std::uint32_t row, const Record& record) {
     }
 }
 
-bool CRunJournal::Append(std::uint32_t row, const Record& record) {
-    if (path_.empty()) return true;  // no content file, nothing to recover for
-    const std::string line = Line(row, record);
+bool CRunJournal::Append(const std::vector<Entry>& entries, bool flush) {
+    if (path_.empty() || entries.empty()) return true;  // no content file, nothing to recover for
+    std::string lines;
+    for (const Entry& entry : entries) lines += Line(entry.first, entry.second);
     try {
         if (!file_) {
             auto file = std::make_unique<plat::CFile>();
@@ -110,23 +111,24 @@ bool CRunJournal::Append(std::uint32_t row, const Record& record) {
             file->Seek(0, plat::CFile::end);
             file_ = std::move(file);
         }
-        file_->Write(line.data(), static_cast<std::uint32_t>(line.size()));
-        file_->Flush();
+        file_->Write(lines.data(), static_cast<std::uint32_t>(lines.size()));
+        if (flush) file_->Flush();
     } catch (const plat::CFileException& error) {
         TRACE(g_TraceLog, "CRunJournal: unable to write to '%s', error code is %d; the step is not taken",
               path_.c_str(), static_cast<int>(error.OsError()));
         file_.reset();  // a later record opens it again rather than write after a torn line
         return false;
     }
-    Fold(row, record);
+    for (const Entry& entry : entries) Fold(entry.first, entry.second);
     return true;
 }
 
-bool CRunJournal::RecordBackup(std::uint32_t row, const std::string& download, const std::string& target,
-                               const std::string& backup, const plat::files::FileStatus& before) {
-    return Append(row, Record{'B',
-                              {download, target, backup, Hex(before.attributes), Hex(before.creation),
-                               Hex(before.lastAccess), Hex(before.lastWrite)}});
+bool CRunJournal::RecordBackupAndReplace(std::uint32_t row, const std::string& download, const std::string& target,
+                                         const std::string& backup, const plat::files::FileStatus& before) {
+    const Record b{'B',
+                   {download, target, backup, Hex(before.attributes), Hex(before.creation), Hex(before.lastAccess),
+                    Hex(before.lastWrite)}};
+    return Append({Entry{row, b}, Entry{row, Record{'R', {download, target, backup}}}});
 }
 
 bool CRunJournal::RecordReplace(std::uint32_t row, const std::string& download, const std::string& target,
@@ -142,16 +144,19 @@ bool CRunJournal::RecordExpansion(std::uint32_t row, const std::string& download
     return Append(row, Record{'X', {download}});
 }
 
-bool CRunJournal::RecordCommitted(const std::vector<std::uint32_t>& rows) {
-    bool recorded = true;
+// The records of the pending rows among rows, of one kind, written together.
+std::vector<CRunJournal::Entry> CRunJournal::Marks(const std::vector<std::uint32_t>& rows, char kind) const {
+    std::vector<Entry> entries;
     for (std::uint32_t row : rows)
-        if (IsPending(row)) recorded = Append(row, Record{'C', {}}) && recorded;
-    return recorded;
+        if (IsPending(row)) entries.push_back(Entry{row, Record{kind, {}}});
+    return entries;
 }
+
+bool CRunJournal::RecordCommitted(const std::vector<std::uint32_t>& rows) { return Append(Marks(rows, 'C'), false); }
 
 bool CRunJournal::RecordUndone(std::uint32_t row) { return !IsPending(row) || Append(row, Record{'U', {}}); }
 
-bool CRunJournal::RecordCleaned(std::uint32_t row) { return !IsPending(row) || Append(row, Record{'K', {}}); }
+bool CRunJournal::RecordCleaned(const std::vector<std::uint32_t>& rows) { return Append(Marks(rows, 'K'), false); }
 
 bool CRunJournal::Discard() {
     pending_.clear();

@@ -5,7 +5,15 @@
 //
 // The file: "<content file>.$jnl$", text, one record a line ending in LF, fields separated by
 // "|" (no Windows path holds one). Each record is flushed to the disk before the step it
-// announces begins.
+// announces begins; records written together go out with one flush:
+//   - a target that is backed up has its B and its R record written together, before the
+//     backup: a backup is made whole or not at all (a second name of the target, or a copy
+//     renamed into place), and an R whose backup does not exist finds the target untouched.
+// C and K records announce no step and are not flushed (the next flush of the journal carries
+// them): without its C record a row is still found committed by the content file, saved and
+// flushed before the C records are written; without its K record a row's clean-up is done once
+// more, which finds nothing left to remove. The K records of a clean-up are written after its
+// deletions were made durable (their folders flushed), so a K never hides a file that came back.
 //   B|row|download|target|backup|attributes|created|accessed|written
 //                                  the target is about to be backed up under backup; the
 //                                  attributes and times it has (hexadecimal), to give back
@@ -40,6 +48,7 @@
 #include <map>
 #include <memory>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "platform/files.h"
@@ -71,17 +80,18 @@ public:
     // True when the row waits for the recovery of an earlier run.
     bool IsPending(std::uint32_t row) const;
 
-    // The records, each flushed before it returns. False, with a trace line, when it could not
-    // be written: the step it announces must not happen.
-    bool RecordBackup(std::uint32_t row, const std::string& download, const std::string& target,
-                      const std::string& backup, const plat::files::FileStatus& before);
+    // The records, flushed before it returns (but C and K). False, with a trace line, when they
+    // could not be written: the step they announce must not happen.
+    // B and R together: target is about to be backed up under backup, then replaced.
+    bool RecordBackupAndReplace(std::uint32_t row, const std::string& download, const std::string& target,
+                                const std::string& backup, const plat::files::FileStatus& before);
     bool RecordReplace(std::uint32_t row, const std::string& download, const std::string& target,
                        const std::string& backup);
     bool RecordQueued(std::uint32_t row, const std::string& download, const std::string& target);
     bool RecordExpansion(std::uint32_t row, const std::string& download);
     bool RecordCommitted(const std::vector<std::uint32_t>& rows);
     bool RecordUndone(std::uint32_t row);
-    bool RecordCleaned(std::uint32_t row);
+    bool RecordCleaned(const std::vector<std::uint32_t>& rows);
 
     // Gives a restored target the read-only attribute and the times it had before (a copy
     // brings neither back).
@@ -105,7 +115,10 @@ public:
     const std::map<std::uint32_t, std::vector<Record>>& PendingRecords() const { return pending_; }
 
 private:
-    bool Append(std::uint32_t row, const Record& record);
+    using Entry = std::pair<std::uint32_t, Record>;
+    bool Append(std::uint32_t row, const Record& record) { return Append({Entry{row, record}}); }
+    bool Append(const std::vector<Entry>& entries, bool flush = true);  // one write, one flush
+    std::vector<Entry> Marks(const std::vector<std::uint32_t>& rows, char kind) const;
     void Fold(std::uint32_t row, const Record& record);
     bool RecoverRow(std::uint32_t row, const CommittedTest& committed);
     bool RemoveBackups(std::uint32_t row) const;

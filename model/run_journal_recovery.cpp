@@ -106,7 +106,7 @@ bool CRunJournal::RecoverRow(std::uint32_t row, const CommittedTest& committed) 
         // As in the clean-up, a download that cannot be removed is left, and one that is the
         // installed file itself stays.
         if (!download.empty() && !IsTargetOf(records, download)) RemoveNamed(download);
-        return RecordCleaned(row);
+        return RecordCleaned({row});
     }
     TRACE(g_TraceLog, "CRunJournal: row %d was not applied by a run that did not finish, undoing what it did",
           static_cast<int>(row));

@@ -95,8 +95,9 @@ private:
     std::string TargetDirectory() const;
     std::string TargetPath() const;
     std::int32_t Install();
-    bool PreserveTarget(const std::string& target);
-    bool BackUp(const std::string& target);
+    // *announced: the journal already holds the replacement's record (written with the backup's).
+    bool PreserveTarget(const std::string& target, bool* announced);
+    bool BackUp(const std::string& target, bool* announced);
     void InstallThroughSetup(const std::string& target);
     std::int32_t RunCommands();
     bool Undo();

@@ -26,8 +26,10 @@ std::int32_t CFile_::Install() {
     // A folder that cannot be made shows as the copy's failure below.
     CreateDirectoryTree(TargetDirectory());
     const std::string target = TargetPath();
-    if (!PreserveTarget(target)) return kNotApplied;
-    if (Journal && !Journal->RecordReplace(Row, DownLoadCacheFile, target, BackupFileName)) return kNotApplied;
+    bool announced = false;
+    if (!PreserveTarget(target, &announced)) return kNotApplied;
+    if (Journal && !announced && !Journal->RecordReplace(Row, DownLoadCacheFile, target, BackupFileName))
+        return kNotApplied;
     if (!plat::files::Copy(DownLoadCacheFile, target, false)) {
         InstallThroughSetup(target);
         return kNotApplied;
@@ -41,7 +43,7 @@ std::int32_t CFile_::Install() {
 
 // Makes sure the target's present state can be restored; false stops Apply before the target
 // is touched.
-bool CFile_::PreserveTarget(const std::string& target) {
+bool CFile_::PreserveTarget(const std::string& target, bool* announced) {
     if (!plat::files::Exists(target)) {
         TRACE(g_TraceLog,
               "CFile_: Backup not needed, no instance of target file on system to back up...");
@@ -60,20 +62,23 @@ bool CFile_::PreserveTarget(const std::string& target) {
         }
         return true;
     }
-    return BackUp(target);
+    return BackUp(target, announced);
 }
 
 // A backup always takes a name that was free, so it can only ever be this run's own file: a
 // file found under a backup's name is left alone, whatever it holds. A retried group backs up
-// into the name made the first time (its rollback removed that backup).
-bool CFile_::BackUp(const std::string& target) {
+// into the name made the first time (its rollback removed that backup). The replacement is
+// announced with the backup, in one flush of the journal: the backup is made whole or not at
+// all, so a run that ends before it finds the target untouched.
+bool CFile_::BackUp(const std::string& target, bool* announced) {
     const bool retried = !BackupFileName.empty();
     if (!retried) BackupFileName = MakeBackupFileName(target);
     plat::files::GetStatus(target, &TargetBefore);  // what a restore gives back
     ClearReadOnly(target);  // a read-only target fails the copy, which reports it
     if (retried) ClearReadOnly(BackupFileName);  // a backup of a read-only target is read-only too
-    if (Journal && !Journal->RecordBackup(Row, DownLoadCacheFile, target, BackupFileName, TargetBefore))
+    if (Journal && !Journal->RecordBackupAndReplace(Row, DownLoadCacheFile, target, BackupFileName, TargetBefore))
         return false;
+    *announced = Journal != nullptr;
     if (!plat::files::CopyToKeep(target, BackupFileName)) {
         TRACE(g_TraceLog, "CFile_: Backup of file %s to %s failed, reason code is %d",
               FileName.c_str(), BackupFileName.c_str(), plat::LastError());

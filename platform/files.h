@@ -42,6 +42,26 @@ bool Rename(const std::string& from, const std::string& to, bool replace);
 // ahead of any later change that is flushed.
 bool Remove(const std::string& path);
 
+// Deletions and copies whose folders are flushed together. While a batch lives (one per thread
+// at a time), Remove and Copy on the emulated machine do not flush the folder of the name they
+// change but note it, and Flush, or the end of the batch, flushes every noted folder once. For
+// changes that nothing orders among themselves (the copies of a group's files, a run's clean-up
+// of its backups and downloads); a step that counts on them comes after Flush, and CopyToKeep
+// still flushes at once (its name must be on the disk before its source is replaced). On
+// Windows there is nothing to gather.
+class FolderFlushBatch {
+public:
+    FolderFlushBatch();
+    ~FolderFlushBatch();  // flushes what is noted
+    FolderFlushBatch(const FolderFlushBatch&) = delete;
+    FolderFlushBatch& operator=(const FolderFlushBatch&) = delete;
+    // Flushes the folders noted so far; false when one of them could not be flushed.
+    bool Flush();
+
+private:
+    [[maybe_unused]] bool outermost_ = false;  // an inner batch leaves the notes to this one
+};
+
 // Attributes of a file or folder; kInvalidAttributes and the last error when missing.
 std::uint32_t GetAttributes(const std::string& path);
 // Sets the attributes (only read-only is stored; the others are accepted and ignored).

@@ -165,6 +165,8 @@ struct Finish {
     bool renameStep = false;
     // Keep the replaced version as the target's spare (see SpareOf) instead of deleting it.
     bool keepSpare = false;
+    // The folder's flush may wait for the end of a folder flush batch (a plain Copy).
+    bool batched = false;
 };
 
 // A file that is rewritten again and again (the content file, after every group of a run)
@@ -210,13 +212,17 @@ bool FillAndFlush(int fd, const std::function<bool(int)>& fill, const Finish& fi
 // exchange names, or target does not exist yet, it is a plain rename. The folder is flushed, so
 // that the new bytes keep the name after a power cut; a failed folder flush cannot undo the
 // replacement any more, and is left for the next flush of the folder to make good.
-bool TakeTargetName(const std::string& from, const std::string& target, bool keepSpare) {
-    if (keepSpare && renameat2(AT_FDCWD, from.c_str(), AT_FDCWD, target.c_str(), RENAME_EXCHANGE) == 0) {
+bool TakeTargetName(const std::string& from, const std::string& target, const Finish& finish) {
+    if (finish.keepSpare && renameat2(AT_FDCWD, from.c_str(), AT_FDCWD, target.c_str(), RENAME_EXCHANGE) == 0) {
         if (rename(from.c_str(), SpareOf(target).c_str()) != 0) unlink(from.c_str());
     } else if (rename(from.c_str(), target.c_str()) != 0) {
         return false;
     }
-    FlushFolder(FolderOf(target));
+    if (finish.batched) {
+        posix::FlushFolderOrNote(FolderOf(target));
+    } else {
+        FlushFolder(FolderOf(target));
+    }
     return true;
 }
 
@@ -235,7 +241,7 @@ bool ReplaceAtomically(const std::string& target, const std::function<bool(int)>
         unlink(temp.c_str());
         return false;
     }
-    if (ok && !TakeTargetName(temp, target, finish.keepSpare)) {
+    if (ok && !TakeTargetName(temp, target, finish)) {
         ok = false;
         err = errno;
     }
@@ -335,8 +341,9 @@ std::string SelfExecutable() {
 
 namespace {
 
-// Copy after the fault plan allowed it.
-bool CopyAllowed(const std::string& src, const std::string& dst, bool failIfExists) {
+// Copy after the fault plan allowed it. batched: its folder's flush may wait for the end of a
+// folder flush batch.
+bool CopyAllowed(const std::string& src, const std::string& dst, bool failIfExists, bool batched) {
     std::string from, to;
     if (!HostOf(src, &from) || !HostOf(dst, &to)) return false;
     struct stat srcStat, dstStat;
@@ -354,6 +361,7 @@ bool CopyAllowed(const std::string& src, const std::string& dst, bool failIfExis
         Finish finish;
         finish.mode = srcStat.st_mode;
         finish.times = times;
+        finish.batched = batched;
         ok = ReplaceAtomically(to, [in](int out) { return CopyContent(in, out); }, finish);
     }
     close(in);
@@ -377,7 +385,7 @@ bool LinkToKeep(const std::string& from, const std::string& to) {
 
 bool Copy(const std::string& src, const std::string& dst, bool failIfExists) {
     if (!fault::Allow(fault::Op::Copy)) return false;
-    return CopyAllowed(src, dst, failIfExists);
+    return CopyAllowed(src, dst, failIfExists, true);
 }
 
 bool CopyToKeep(const std::string& src, const std::string& dst) {
@@ -392,7 +400,8 @@ bool CopyToKeep(const std::string& src, const std::string& dst) {
     } else if (errno == ENOENT && LinkToKeep(from, to)) {
         return true;
     }
-    return CopyAllowed(src, dst, false);
+    // The backup's name must be on the disk before its source is replaced: never batched.
+    return CopyAllowed(src, dst, false, false);
 }
 
 bool Rename(const std::string& from, const std::string& to, bool replace) {
@@ -427,8 +436,8 @@ bool Remove(const std::string& path) {
     if (unlink(host.c_str()) != 0) return FailErrno(host);
     unlink(SpareOf(host).c_str());  // the previous version of a file that WriteAllDurably kept
     // A deletion that a later step counts on (a backup gone before the journal that names it)
-    // must not come back after a power cut.
-    FlushFolder(FolderOf(host));
+    // must not come back after a power cut; a removal batch flushes it with its others.
+    posix::FlushFolderOrNote(FolderOf(host));
     return true;
 }
 

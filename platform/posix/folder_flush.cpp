@@ -3,6 +3,9 @@
 #include <fcntl.h>
 #include <unistd.h>
 
+#include <set>
+
+#include "platform/files.h"
 #include "platform/power_cut.h"
 
 namespace plat::posix {
@@ -16,6 +19,19 @@ bool FlushFolder(const std::string& hostFolder) {
     return flushed;
 }
 
+namespace {
+// The folders that the live folder flush batch of this thread has noted; null while there is none.
+thread_local std::set<std::string>* gathered = nullptr;
+}  // namespace
+
+void FlushFolderOrNote(const std::string& hostFolder) {
+    if (gathered) {
+        gathered->insert(hostFolder);
+    } else {
+        FlushFolder(hostFolder);
+    }
+}
+
 std::string FolderOf(const std::string& hostPath) {
     const std::size_t slash = hostPath.find_last_of('/');
     if (slash == std::string::npos) return ".";
@@ -23,3 +39,26 @@ std::string FolderOf(const std::string& hostPath) {
 }
 
 }  // namespace plat::posix
+
+namespace plat::files {
+
+FolderFlushBatch::FolderFlushBatch() : outermost_(posix::gathered == nullptr) {
+    if (outermost_) posix::gathered = new std::set<std::string>();
+}
+
+FolderFlushBatch::~FolderFlushBatch() {
+    if (!outermost_) return;
+    Flush();
+    delete posix::gathered;
+    posix::gathered = nullptr;
+}
+
+bool FolderFlushBatch::Flush() {
+    if (!posix::gathered) return true;
+    bool flushed = true;
+    for (const std::string& folder : *posix::gathered) flushed = posix::FlushFolder(folder) && flushed;
+    posix::gathered->clear();
+    return flushed;
+}
+
+}  // namespace plat::files

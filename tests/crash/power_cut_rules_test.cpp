@@ -111,6 +111,32 @@ TEST_F(PowerCutRules, WhatThePlatformReportsDoneSurvivesACut) {
     EXPECT_EQ(machine.ReadFile("C:\\d\\created.txt"), "created");
 }
 
+// A folder flush batch makes its copies and deletions durable when it ends, not before; a
+// backup (CopyToKeep) never waits for it, since its name must be on the disk before its source
+// is replaced.
+TEST_F(PowerCutRules, ABatchMakesItsCopiesAndDeletionsDurableWhenItEnds) {
+    machine.WriteFile("C:\\d\\source.txt", "source");
+    machine.WriteFile("C:\\d\\gone.txt", "old");
+    machine.WriteFile("C:\\e\\target.txt", "target");
+    machine.WriteFile("C:\\f\\gone.txt", "old");
+    ASSERT_TRUE(CutAfter([] {
+        {
+            files::FolderFlushBatch ended;
+            files::Copy("C:\\d\\source.txt", "C:\\d\\copy.txt", false);
+            files::Remove("C:\\d\\gone.txt");
+        }
+        new files::FolderFlushBatch();  // still open at the cut (the child ends there)
+        files::CopyToKeep("C:\\e\\target.txt", "C:\\e\\kept.txt");
+        files::Copy("C:\\d\\source.txt", "C:\\f\\pending.txt", false);
+        files::Remove("C:\\f\\gone.txt");
+    }));
+    EXPECT_EQ(machine.ReadFile("C:\\d\\copy.txt"), "source");
+    EXPECT_FALSE(files::Exists("C:\\d\\gone.txt"));
+    EXPECT_EQ(machine.ReadFile("C:\\e\\kept.txt"), "target");
+    EXPECT_FALSE(files::Exists("C:\\f\\pending.txt"));
+    EXPECT_TRUE(files::Exists("C:\\f\\gone.txt"));
+}
+
 // A file staged for the restart is whole on the disk before the queue names it.
 TEST_F(PowerCutRules, AFileStagedForTheRestartSurvivesWithTheQueue) {
     machine.WriteFile("C:\\d\\new.dll", "version 2");

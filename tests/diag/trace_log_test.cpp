@@ -7,6 +7,7 @@
 #include <regex>
 
 #include "diag/trace_startup.h"
+#include "platform/cfile.h"
 #include "platform/errors.h"
 #include "platform/fault.h"
 #include "platform/files.h"
@@ -95,12 +96,14 @@ TEST_F(TraceLogTest, FileThatCannotBeOpenedSwitchesFileOutputOff) {
     EXPECT_FALSE(g_TraceLog.fileOutput);
 }
 
-TEST_F(TraceLogTest, FailedWriteDropsTheRestOfThatLineOnly) {
+// A line goes out in one write, so a failed write loses that line whole, never a part of it.
+TEST_F(TraceLogTest, FailedWriteDropsThatLineOnly) {
     g_TraceLog.timestamps = false;
-    plat::fault::FailNth(plat::fault::Op::Write, 2, plat::kErrorDiskFull);  // the first line end
-    TRACE(g_TraceLog, "kept\ndropped");
+    TRACE(g_TraceLog, "first");
+    plat::fault::FailNth(plat::fault::Op::Write, 1, plat::kErrorDiskFull);
+    TRACE(g_TraceLog, "dropped\nwhole");
     TRACE(g_TraceLog, "next");
-    EXPECT_EQ(trace.Bytes(), "keptnext\r\n");
+    EXPECT_EQ(trace.Bytes(), "first\r\nnext\r\n");
 }
 
 TEST_F(TraceLogTest, KeepOpenHoldsTheFileBetweenLines) {
@@ -112,6 +115,39 @@ TEST_F(TraceLogTest, KeepOpenHoldsTheFileBetweenLines) {
     EXPECT_TRUE(g_TraceLog.IsOpen());
     TRACE(g_TraceLog, "after");
     EXPECT_FALSE(g_TraceLog.IsOpen());
+    EXPECT_EQ(trace.Lines(), (Lines{"burst 1", "burst 2", "after"}));
+}
+
+// The log's host path is mapped once; a folder spelled otherwise since then fails the open,
+// which maps the path again instead of losing the log.
+TEST_F(TraceLogTest, FolderMadeAgainInAnotherCaseIsFoundAfterAFailedOpen) {
+    TraceLog log("C:\\Logs\\run.log");
+    ASSERT_TRUE(plat::files::MakeDirectory("C:\\LOGS"));
+    TRACE(log, "before");
+    ASSERT_TRUE(plat::files::Remove("C:\\Logs\\run.log"));
+    ASSERT_TRUE(plat::files::RemoveDirectory("C:\\LOGS"));
+    ASSERT_TRUE(plat::files::MakeDirectory("C:\\logs"));
+    TRACE(log, "after");
+    EXPECT_TRUE(log.fileOutput);
+    EXPECT_EQ(pextest::TraceLines(m.ReadFile("C:\\logs\\run.log")), Lines{"after"});
+}
+
+// On the emulated machine the share lock is let go between the lines of a burst, as it was
+// before a line held it: a reader that denies writers gets in, and the line that meets it is
+// dropped. Windows refuses that reader while the burst's handle is open for writing.
+TEST_F(TraceLogTest, BurstLetsOtherOpenersInBetweenItsLines) {
+#ifdef _WIN32
+    GTEST_SKIP() << "Windows keeps a deny-write reader out while the log is open for writing";
+#endif
+    g_TraceLog.keepOpen = true;
+    TRACE(g_TraceLog, "burst 1");
+    plat::CFile reader;
+    ASSERT_TRUE(reader.Open(trace.Path(), plat::CFile::modeRead | plat::CFile::shareDenyWrite));
+    TRACE(g_TraceLog, "dropped");
+    reader.Close();
+    TRACE(g_TraceLog, "burst 2");
+    g_TraceLog.keepOpen = false;
+    TRACE(g_TraceLog, "after");
     EXPECT_EQ(trace.Lines(), (Lines{"burst 1", "burst 2", "after"}));
 }
 
