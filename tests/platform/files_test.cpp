@@ -4,9 +4,7 @@
 
 #include <gtest/gtest.h>
 #ifndef _WIN32
-#include <signal.h>
 #include <sys/file.h>
-#include <sys/resource.h>
 #include <fcntl.h>
 #include <unistd.h>
 #endif
@@ -17,7 +15,6 @@
 #include "platform/errors.h"
 #include "platform/fault.h"
 #include "platform/paths.h"
-#include "platform/process.h"
 #include "tests/support/platform_guard.h"
 #include "tests/support/test_machine.h"
 
@@ -129,41 +126,11 @@ TEST_F(Files, ACopyToKeepOutlivesTheReplacedSource) {
     ExpectFails(files::CopyToKeep("C:\\app\\none.txt", "C:\\app\\none.$bak$"), plat::kErrorFileNotFound);
 }
 
-TEST_F(Files, ARunningProgramIsInUse) {
-    PEX_LINUX_ONLY();
-    fs::copy_file("/bin/sleep", m.DriveC() + "/app/sleep.exe");
-    plat::proc::Process running;
-    ASSERT_TRUE(plat::proc::Start("C:\\app\\sleep.exe 60", "", &running));
-    ExpectFails(files::Copy("C:\\app\\src.txt", "C:\\app\\sleep.exe", false), plat::kErrorSharingViolation);
-    ExpectFails(files::Remove("C:\\app\\sleep.exe"), plat::kErrorSharingViolation);
-    ASSERT_TRUE(plat::proc::Terminate(running, 1));
-    EXPECT_EQ(plat::proc::Wait(running, plat::proc::kInfinite), plat::proc::WaitResult::Ended);
-    EXPECT_TRUE(files::Remove("C:\\app\\sleep.exe"));
-}
-
 TEST_F(Files, AFailedCopyLeavesTheTargetWhole) {
     plat::fault::FailNth(plat::fault::Op::Copy, 1, plat::kErrorDiskFull);
     ExpectFails(files::Copy("C:\\app\\src.txt", "C:\\app\\dst.txt", false), plat::kErrorDiskFull);
     EXPECT_EQ(m.ReadFile("C:\\app\\dst.txt"), "old content");
 
-#ifndef _WIN32
-    // A real write failure half way: the file size limit stops the temporary file.
-    m.WriteFile("C:\\app\\big.bin", std::string(1 << 20, 'b'));
-    struct rlimit saved;
-    getrlimit(RLIMIT_FSIZE, &saved);
-    struct rlimit small = saved;
-    small.rlim_cur = 4096;
-    const auto oldHandler = signal(SIGXFSZ, SIG_IGN);
-    setrlimit(RLIMIT_FSIZE, &small);
-    const bool copied = files::Copy("C:\\app\\big.bin", "C:\\app\\dst.txt", false);
-    const std::uint32_t code = plat::LastError();
-    setrlimit(RLIMIT_FSIZE, &saved);
-    signal(SIGXFSZ, oldHandler);
-    EXPECT_FALSE(copied);
-    EXPECT_EQ(code, plat::kErrorDiskFull);
-    EXPECT_EQ(m.ReadFile("C:\\app\\dst.txt"), "old content");
-    EXPECT_EQ(Leftovers().size(), 3u);
-#endif
 }
 
 TEST_F(Files, RenameRemoveAndFoldersGiveTheWindowsCodes) {
@@ -247,33 +214,5 @@ TEST_F(Files, DurableWritesReplaceWholeOrNotAtAll) {
 #endif
 }
 
-#ifndef _WIN32
-// A file written again and again swaps between two files on disk: none is created or freed
-// per write, and a spare that is anything but its own plain file is left alone.
-TEST_F(Files, RepeatedDurableWritesReuseOneSpareFile) {
-    const std::string table = m.DriveC() + "/app/table.csv", spare = m.DriveC() + "/app/.pex~table.csv.prev";
-    auto inode = [](const std::string& host) {
-        struct stat st {};
-        return ::stat(host.c_str(), &st) == 0 ? st.st_ino : 0;
-    };
-    ASSERT_TRUE(files::WriteAllDurably("C:\\app\\table.csv", "first, the longest version"));
-    ASSERT_TRUE(files::WriteAllDurably("C:\\app\\table.csv", "second"));
-    const auto a = inode(table), b = inode(spare);
-    ASSERT_NE(b, 0u);
-    ASSERT_TRUE(files::WriteAllDurably("C:\\app\\table.csv", "third"));
-    EXPECT_EQ(inode(table), b);
-    EXPECT_EQ(inode(spare), a);
-    EXPECT_EQ(m.ReadFile("C:\\app\\table.csv"), "third");  // cut to its own length
-    EXPECT_EQ(m.ReadFile("C:\\app\\.pex~table.csv.prev"), "second");
-
-    ASSERT_EQ(::link(spare.c_str(), (m.DriveC() + "/app/other.csv").c_str()), 0);
-    ASSERT_TRUE(files::WriteAllDurably("C:\\app\\table.csv", "fourth"));
-    EXPECT_EQ(m.ReadFile("C:\\app\\other.csv"), "second");
-    EXPECT_EQ(m.ReadFile("C:\\app\\table.csv"), "fourth");
-
-    ASSERT_TRUE(files::Remove("C:\\app\\table.csv"));
-    EXPECT_FALSE(fs::exists(spare));
-}
-#endif
 
 }  // namespace
