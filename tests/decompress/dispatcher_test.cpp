@@ -181,21 +181,24 @@ protected:
 };
 
 // Only a download that needs expanding is given to the dispatcher: one without a method fails,
-// so that its compressed bytes are never installed.
+// so that its compressed bytes are never installed; a patch is never the file itself.
 TEST_F(InPlaceExpansion, CodesWithoutExpansion) {
-    EXPECT_FALSE(Expand(kCompressionNone, "payload"));
-    EXPECT_EQ(trace_.Lines(), (Lines{"CDecompressionObjects::Decompress, file is C:\\dl\\app.exe",
-                                     "CDecompressionObjects::DecompressNone, file is C:\\dl\\app.exe",
-                                     "CDecompressionObjects::DecompressNone, the file needs decompression but its "
-                                     "download type is None, so it cannot be expanded",
-                                     "CDecompressionObjects::Decompress, returning 0"}));
-    EXPECT_FALSE(Expand(kCompressionRTPatch, "payload")) << "a patch is never the file itself";
-    EXPECT_EQ(trace_.Lines(), (Lines{"CDecompressionObjects::Decompress, file is C:\\dl\\app.exe",
-                                     "CDecompressionObjects::DecompressRTPatch, file is C:\\dl\\app.exe THIS FUNCTION NOT IMPLEMENTED YET",
-                                     "CDecompressionObjects::Decompress, returning 0"}));
-    EXPECT_FALSE(Expand(7, "payload"));
-    EXPECT_EQ(trace_.Lines()[1], "CDecompressionObjects::Decompress, Unknown compression type 7");
-    EXPECT_EQ(machine_.ReadFile(kPath), "payload");
+    const std::string d = "CDecompressionObjects::";
+    const std::pair<std::uint32_t, Lines> cases[] = {
+        {kCompressionNone, {d + "DecompressNone, file is C:\\dl\\app.exe",
+                            d + "DecompressNone, the file needs decompression but its download type is None, so it "
+                                "cannot be expanded"}},
+        {kCompressionRTPatch, {d + "DecompressRTPatch, file is C:\\dl\\app.exe THIS FUNCTION NOT IMPLEMENTED YET"}},
+        {7, {d + "Decompress, Unknown compression type 7"}},
+    };
+    for (const auto& [code, middle] : cases) {
+        EXPECT_FALSE(Expand(code, "payload"));
+        Lines expected{d + "Decompress, file is C:\\dl\\app.exe"};
+        expected.insert(expected.end(), middle.begin(), middle.end());
+        expected.push_back(d + "Decompress, returning 0");
+        EXPECT_EQ(trace_.Lines(), expected) << code;
+        EXPECT_EQ(machine_.ReadFile(kPath), "payload");
+    }
 }
 
 TEST_F(InPlaceExpansion, LzwThroughTheLibrary) {

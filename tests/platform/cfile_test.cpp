@@ -37,37 +37,6 @@ protected:
     pextest::TestMachine m;
 };
 
-TEST_F(CFileTest, WritesReadsSeeksAndTruncatesByWindowsPath) {
-    {
-        CFile out;
-        ASSERT_TRUE(out.Open("C:\\APP\\new.bin", kCreateWrite));
-        out.Write("hello world", 11);
-        EXPECT_EQ(out.GetPosition(), 11u);
-        EXPECT_EQ(out.Seek(-5, CFile::end), 6u);
-        out.Write("WORLD", 5);
-        EXPECT_EQ(out.GetLength(), 11u);
-    }
-    EXPECT_EQ(m.ReadFile("C:\\app\\new.bin"), "hello WORLD");
-
-    CFile in;
-    ASSERT_TRUE(in.Open("c:/app/NEW.BIN", CFile::modeRead | CFile::shareDenyWrite));
-    char buffer[32] = {};
-    EXPECT_EQ(in.Seek(6, CFile::begin), 6u);
-    EXPECT_EQ(in.Read(buffer, sizeof buffer), 5u);
-    EXPECT_EQ(std::string(buffer, 5), "WORLD");
-    EXPECT_EQ(in.Read(buffer, sizeof buffer), 0u);  // at the end
-    EXPECT_THROW(in.Seek(-100, CFile::current), CFileException);
-
-    // Create empties an existing file, unless told not to.
-    CFile keep;
-    ASSERT_TRUE(keep.Open("C:\\app\\data.bin",
-                          CFile::modeCreate | CFile::modeNoTruncate | CFile::modeReadWrite | CFile::shareDenyNone));
-    EXPECT_EQ(keep.GetLength(), 10u);
-    keep.Close();
-    ASSERT_TRUE(keep.Open("C:\\app\\data.bin", kCreateWrite));
-    EXPECT_EQ(keep.GetLength(), 0u);
-}
-
 TEST_F(CFileTest, OpenReportsWindowsCodes) {
     ExpectOpenFails("C:\\app\\missing.bin", CFile::modeRead, plat::kErrorFileNotFound);
     ExpectOpenFails("C:\\nowhere\\data.bin", CFile::modeRead, plat::kErrorPathNotFound);

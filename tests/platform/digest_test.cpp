@@ -1,11 +1,9 @@
-// SHA-256 digests of files through the platform's library: the standard vectors, a file longer
-// than one read block, and the Windows codes of files that cannot be read.
+// SHA-256 digests of files through the platform's library: the standard vectors and a file
+// longer than one read block. A download that cannot be read is update_file_digest_test's.
 #include "platform/digest.h"
 
 #include <gtest/gtest.h>
 
-#include "platform/cfile.h"
-#include "platform/errors.h"
 #include "tests/support/test_machine.h"
 
 namespace {
@@ -35,28 +33,6 @@ TEST_F(Digest, AFileOfSeveralBlocksIsDigestedWhole) {
     std::string hex;
     ASSERT_TRUE(Sha256File("C:\\d\\big.bin", &hex));
     EXPECT_EQ(hex, "f22b2b9b77c00d49092ef7c8c522d1067a19423ab30ed2aae987e511b95d82a2");
-}
-
-TEST_F(Digest, AFileThatCannotBeReadGivesItsWindowsCode) {
-    m.WriteFile("C:\\d\\held.bin", "abc");
-    struct Case {
-        const char* path;
-        std::uint32_t code;
-    };
-    for (const Case& c : {Case{"C:\\d\\missing.bin", plat::kErrorFileNotFound},
-                          Case{"C:\\nowhere\\x.bin", plat::kErrorPathNotFound},
-                          Case{"C:\\d", plat::kErrorAccessDenied}}) {
-        std::string hex = "stale";
-        EXPECT_FALSE(Sha256File(c.path, &hex)) << c.path;
-        EXPECT_EQ(plat::LastError(), c.code) << c.path;
-        EXPECT_EQ(hex, "") << c.path;
-    }
-    // A writer that lets nobody else in keeps the bytes from being checked while they change.
-    plat::CFile writer;
-    ASSERT_TRUE(writer.Open("C:\\d\\held.bin", plat::CFile::modeReadWrite | plat::CFile::shareExclusive));
-    std::string hex;
-    EXPECT_FALSE(Sha256File("C:\\d\\held.bin", &hex));
-    EXPECT_EQ(plat::LastError(), plat::kErrorSharingViolation);
 }
 
 }  // namespace
