@@ -293,6 +293,21 @@ TEST_F(InPlaceExpansion, AnExpansionThatWasNotRecordedIsRecognisedByItsRecord) {
     EXPECT_FALSE(dispatcher_.Decompress(kCompressionZLIB, kPath, nullptr));
 }
 
+// The record names the bytes, not only their length: one byte changed anywhere, also the last
+// one of a read of a single byte (65537 is a block and one), is not the recorded expansion.
+TEST_F(InPlaceExpansion, ARecordNamesTheBytesNotOnlyTheirLength) {
+    const std::string bytes = Sample(65537);
+    for (std::size_t at : {std::size_t{0}, bytes.size() - 1}) {
+        machine_.WriteFile(kPath, bytes);
+        ASSERT_TRUE(RecordExpansion(kPath, kPath));
+        EXPECT_TRUE(IsRecordedExpansion(kPath));
+        std::string changed = bytes;
+        changed[at] ^= 1;
+        machine_.WriteFile(kPath, changed);
+        EXPECT_FALSE(IsRecordedExpansion(kPath)) << at;
+    }
+}
+
 // Damage anywhere in a stream either hits a field that nothing checks (the gzip header's time or
 // system) and the data comes out whole, or the download stays as it arrived; nothing between.
 TEST_F(InPlaceExpansion, DamagedStreamsNeverGiveWrongData) {
