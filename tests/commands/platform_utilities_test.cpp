@@ -45,6 +45,10 @@ TEST_F(UtilitiesTest, FileVersionTextOfAWindowsBinary) {
     machine.WriteFile("C:\\App\\plain.txt", "no version here");
     EXPECT_FALSE(GetFileVersionText("C:\\App\\plain.txt", &text));
     EXPECT_EQ(text, "");
+    std::string noFixedPart = pextest::ReadHostFile(PEX_FIXTURE_DIR "/versioned.dll");
+    noFixedPart[noFixedPart.find("\xBD\x04\xEF\xFE")] = 0;  // the fixed part's signature
+    machine.WriteFile("C:\\App\\nofixed.dll", noFixedPart);
+    EXPECT_FALSE(GetFileVersionText("C:\\App\\nofixed.dll", &text));
 }
 
 // Keys that are not there are the snapshot's test (startup_snapshot_test.cpp).

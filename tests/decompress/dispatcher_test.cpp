@@ -181,21 +181,24 @@ protected:
 };
 
 // Only a download that needs expanding is given to the dispatcher: one without a method fails,
-// so that its compressed bytes are never installed.
+// so that its compressed bytes are never installed; a patch is never the file itself.
 TEST_F(InPlaceExpansion, CodesWithoutExpansion) {
-    EXPECT_FALSE(Expand(kCompressionNone, "payload"));
-    EXPECT_EQ(trace_.Lines(), (Lines{"CDecompressionObjects::Decompress, file is C:\\dl\\app.exe",
-                                     "CDecompressionObjects::DecompressNone, file is C:\\dl\\app.exe",
-                                     "CDecompressionObjects::DecompressNone, the file needs decompression but its "
-                                     "download type is None, so it cannot be expanded",
-                                     "CDecompressionObjects::Decompress, returning 0"}));
-    EXPECT_FALSE(Expand(kCompressionRTPatch, "payload")) << "a patch is never the file itself";
-    EXPECT_EQ(trace_.Lines(), (Lines{"CDecompressionObjects::Decompress, file is C:\\dl\\app.exe",
-                                     "CDecompressionObjects::DecompressRTPatch, file is C:\\dl\\app.exe THIS FUNCTION NOT IMPLEMENTED YET",
-                                     "CDecompressionObjects::Decompress, returning 0"}));
-    EXPECT_FALSE(Expand(7, "payload"));
-    EXPECT_EQ(trace_.Lines()[1], "CDecompressionObjects::Decompress, Unknown compression type 7");
-    EXPECT_EQ(machine_.ReadFile(kPath), "payload");
+    const std::string d = "CDecompressionObjects::";
+    const std::pair<std::uint32_t, Lines> cases[] = {
+        {kCompressionNone, {d + "DecompressNone, file is C:\\dl\\app.exe",
+                            d + "DecompressNone, the file needs decompression but its download type is None, so it "
+                                "cannot be expanded"}},
+        {kCompressionRTPatch, {d + "DecompressRTPatch, file is C:\\dl\\app.exe THIS FUNCTION NOT IMPLEMENTED YET"}},
+        {7, {d + "Decompress, Unknown compression type 7"}},
+    };
+    for (const auto& [code, middle] : cases) {
+        EXPECT_FALSE(Expand(code, "payload"));
+        Lines expected{d + "Decompress, file is C:\\dl\\app.exe"};
+        expected.insert(expected.end(), middle.begin(), middle.end());
+        expected.push_back(d + "Decompress, returning 0");
+        EXPECT_EQ(trace_.Lines(), expected) << code;
+        EXPECT_EQ(machine_.ReadFile(kPath), "payload");
+    }
 }
 
 TEST_F(InPlaceExpansion, LzwThroughTheLibrary) {
@@ -288,6 +291,21 @@ TEST_F(InPlaceExpansion, AnExpansionThatWasNotRecordedIsRecognisedByItsRecord) {
     EXPECT_FALSE(plat::files::Exists(ExpansionRecordName(kPath)));
     // Without a record an expanded download is never taken for expanded: it is not a stream.
     EXPECT_FALSE(dispatcher_.Decompress(kCompressionZLIB, kPath, nullptr));
+}
+
+// The record names the bytes, not only their length: one byte changed anywhere, also the last
+// one of a read of a single byte (65537 is a block and one), is not the recorded expansion.
+TEST_F(InPlaceExpansion, ARecordNamesTheBytesNotOnlyTheirLength) {
+    const std::string bytes = Sample(65537);
+    for (std::size_t at : {std::size_t{0}, bytes.size() - 1}) {
+        machine_.WriteFile(kPath, bytes);
+        ASSERT_TRUE(RecordExpansion(kPath, kPath));
+        EXPECT_TRUE(IsRecordedExpansion(kPath));
+        std::string changed = bytes;
+        changed[at] ^= 1;
+        machine_.WriteFile(kPath, changed);
+        EXPECT_FALSE(IsRecordedExpansion(kPath)) << at;
+    }
 }
 
 // Damage anywhere in a stream either hits a field that nothing checks (the gzip header's time or

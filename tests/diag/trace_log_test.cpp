@@ -47,13 +47,6 @@ TEST_F(TraceLogTest, EveryLineEndsInExactlyOneCarriageReturnLineFeed) {
     EXPECT_EQ(trace.Bytes(), "plain\r\nbare line feed\r\nalready windows\r\nfirst\r\nsecond\r\n\r\nno end");
 }
 
-TEST_F(TraceLogTest, LongMessageIsWrittenWhole) {
-    std::string text(20000, 'x');
-    text += "end";
-    TRACE(g_TraceLog, "[%s] %d%% %5.1f", text.c_str(), 42, 2.25);
-    EXPECT_EQ(trace.Lines(), Lines{"[" + text + "] 42%   2.2"});
-}
-
 TEST_F(TraceLogTest, SubstitutionReplacesEveryOccurrenceFromTheStartAgain) {
     ASSERT_TRUE(g_TraceLog.SetSubstitution("secret", "***"));
     TRACE(g_TraceLog, "a secret and a secret");

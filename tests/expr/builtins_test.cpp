@@ -126,6 +126,11 @@ TEST(Builtins, FileTests) {
     }
     EXPECT_FALSE(atLeast(Literal("C:\\App\\a.dll"), "0.0.0.0"));
     EXPECT_FALSE(atLeast(Literal("C:\\App\\missing.dll"), "0.0.0.0"));
+    // Version information without its fixed part (its signature broken) has no file version.
+    std::string bytes = pextest::ReadHostFile(PEX_FIXTURE_DIR "/versioned.dll");
+    bytes[bytes.find("\xBD\x04\xEF\xFE")] = 0;
+    machine.WriteFile("C:\\App\\nofixed.dll", bytes);
+    EXPECT_FALSE(atLeast(Literal("C:\\App\\nofixed.dll"), "0.0.0.0"));
 }
 
 TEST(Builtins, LookupsAreIndentedByTheNestingDepth) {

@@ -37,20 +37,6 @@ TEST_F(ExecutionPlanTest, OneAssignmentFromParseToRow) {
                      "That's all folks!"}));
 }
 
-TEST_F(ExecutionPlanTest, TreeBuildingTraces) {
-    ExecutionPlan plan;
-    ASSERT_TRUE(QuietParse(plan, "SNOOZEABLE = AND(TRUE, \"x\"); FORCED = FileName"));
-    EXPECT_EQ(trace.Lines(),
-              (Lines{"Parsing: SNOOZEABLE = AND(TRUE, \"x\"); FORCED = FileName",
-                     "Evaluate Function [AND()]. Params are 2:true,x", "[true]", "[x]",
-                     "Function Result: (Result:AND())",
-                     "Error creating Variable [SNOOZEABLE]: Unknown Name!",
-                     "Assigning Setting:HResult: 0x8000ffff(Failed!):=AND()", "pushing # 1, SET()",
-                     "Creating Variable [FileName] of type Func",
-                     "Creating Variable [FORCED] of type Func",
-                     "Assigning Setting:FORCED()=FileName()", "pushing # 2, SET()"}));
-}
-
 TEST_F(ExecutionPlanTest, EveryItemRunsAndFailuresAreRecorded) {
     TestRow noAvar("Force Download,HomeDir", "0,C:\\App");
     ExecutionPlan plan;
@@ -92,10 +78,6 @@ TEST_F(ExecutionPlanTest, TheCurrentPlanReceivesThePushes) {
         EXPECT_EQ(plan.Items().size(), 2u);
         EXPECT_EQ(&CurrentPlan(), &plan);
     }
-    EXPECT_EQ(&CurrentPlan(), &DefaultPlan());
-    std::size_t before = DefaultPlan().Items().size();
-    MakeAssignment(COverrideExpression::FromString("FORCED"), COverrideExpression::FromBool(true));
-    EXPECT_EQ(DefaultPlan().Items().size(), before + 1);
 }
 
 }  // namespace

@@ -1,5 +1,5 @@
-// CFile_ on an emulated machine: installing over an absent or present target, the date stamp,
-// install commands, the setup fallback, and rollbacks that never lose the previous version.
+// CFile_ on an emulated machine: backups beside older ones, install commands, the setup
+// fallback, and rollbacks that never lose the previous version. Whole runs cover the rest.
 #include "model/update_file.h"
 
 #include <gtest/gtest.h>
@@ -54,31 +54,6 @@ TEST_F(UpdateFile, DecompressesInPlaceThroughOneSharedDecompressor) {
     EXPECT_FALSE(trace.Contains("CFile_::Decompress, creating Decompressor"));
 }
 
-TEST_F(UpdateFile, NewTargetNeedsNoBackupAndItsRollbackDeletesIt) {
-    CFile_ file = Make();
-    trace.Clear();
-    EXPECT_EQ(1, file.Apply());
-    EXPECT_EQ("new", Read(kTarget));
-    EXPECT_EQ(trace.Lines(), (Lines{
-        "CFile_: Apply",
-        "CFile_: Applying file 'Dist\\a.dll'",
-        "CFile_: Backup not needed, no instance of target file on system to back up...",
-        "CFile_: Copy successful, source is (C:\\Cache\\a.dll), target is (C:\\App\\Sub\\a.dll)",
-        "CFile_: SetFileDateTime, Unable to parse provided date time string ''",
-        "CFile_: No Commands found",
-        "CFile_: return value is 1",
-    }));
-    machine.WriteFile(kDownload, "newer");
-    EXPECT_EQ(1, file.Apply());  // applied once is applied: nothing is copied again
-    EXPECT_EQ("new", Read(kTarget));
-
-    EXPECT_TRUE(file.Rollback());
-    EXPECT_FALSE(Exists(kTarget));
-    EXPECT_TRUE(trace.Contains("CFile_: No backup file name, removing original"));
-    EXPECT_TRUE(file.Remove());
-    EXPECT_FALSE(Exists(kDownload));
-}
-
 TEST_F(UpdateFile, ExistingTargetIsBackedUpBesideAnyOlderBackupAndRestored) {
     machine.WriteFile(kTarget, "old");
     machine.WriteFile(kBackup, "someone else's");
@@ -105,25 +80,6 @@ TEST_F(UpdateFile, AFailedBackupLeavesAReadOnlyTargetAlone) {
         "CFile_: Backup of file Dist\\a.dll to C:\\App\\Sub\\a.dll.$bak$ failed, reason code is 112"));
     EXPECT_TRUE(file.Rollback());  // nothing to undo
     EXPECT_EQ("old", Read(kTarget));
-}
-
-// The stamp's value is checked end to end (the apply pipeline's complete success).
-TEST_F(UpdateFile, DateIsStampedAndABadDateOnlyCostsTheStamp) {
-    CFile_ file = Make("", "12/31/2003 22:30:00.250");
-    EXPECT_EQ(1, file.Apply());
-    EXPECT_TRUE(trace.Contains("CFile_: SetFileDateTime, success setting file time for "
-                               "'C:\\App\\Sub\\a.dll' to 12/31/2003 22:30:00"));
-
-    plat::files::FileStatus download, target;
-    ASSERT_TRUE(plat::files::GetStatus(kDownload, &download));
-    ASSERT_TRUE(file.Rollback());
-    EXPECT_EQ(1, Make("", "next Tuesday").Apply());
-    ASSERT_TRUE(plat::files::GetStatus(kTarget, &target));
-    EXPECT_EQ(download.lastWrite, target.lastWrite);  // as the copy left it
-
-    EXPECT_FALSE(Make("", "1/1/1600").SetFileDateTime(kTarget));
-    EXPECT_TRUE(trace.Contains("CFile_: SetFileDateTime, Unable to convert System Time object to "
-                               "File Time object. GetLastError returns 87"));
 }
 
 // Result 4 leaves the new file in place, not applied; Rollback still puts the old one back.

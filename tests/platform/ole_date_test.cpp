@@ -43,7 +43,8 @@ const Accepted kAccepted[] = {
     {"december 31, 2003 10 PM", {2003, 12, 31, 22, 0, 0}}, {"Dec 2003", {2003, 12, 1, 0, 0, 0}},
     {"12/2003", {2003, 12, 1, 0, 0, 0}}, {"  12/31/2003\t", kNewYearsEve},
     {"12/31/2003 12:00:00 AM", {2003, 12, 31, 0, 0, 0}}, {"12/31/2003 12:15 PM", {2003, 12, 31, 12, 15, 0}},
-    {"99-12-31", {1999, 12, 31, 0, 0, 0}},
+    {"99-12-31", {1999, 12, 31, 0, 0, 0}}, {"12/11/2003", {2003, 12, 11, 0, 0, 0}},
+    {"2003/12", {2003, 12, 1, 0, 0, 0}}, {"99/12", {1999, 12, 1, 0, 0, 0}},
 };
 
 TEST(OleDateParse, AcceptsTheTextsWindowsAccepts) {
@@ -51,6 +52,18 @@ TEST(OleDateParse, AcceptsTheTextsWindowsAccepts) {
         OleDateTime value;
         EXPECT_TRUE(plat::ParseDateTime(a.text, &value)) << a.text;
         EXPECT_EQ(Show(value), Show(a.value)) << a.text;
+    }
+}
+
+// Without a year the date falls in the current year (the clock's, so not checked here); month and
+// day follow the same rules as with one.
+TEST(OleDateParse, DatesWithoutAYear) {
+    const struct { const char* text; int month, day; } cases[] = {
+        {"12/11", 12, 11}, {"13/12", 12, 13}, {"12/13", 12, 13}, {"Dec 13", 12, 13}};
+    for (const auto& c : cases) {
+        OleDateTime value;
+        ASSERT_TRUE(plat::ParseDateTime(c.text, &value)) << c.text;
+        EXPECT_EQ(value.month * 100 + value.day, c.month * 100 + c.day) << c.text;
     }
 }
 

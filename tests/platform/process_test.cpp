@@ -115,21 +115,4 @@ TEST(Process, ProgramThatCannotStart) {
     plat::fault::Clear();
 }
 
-TEST(Process, ProcessPastItsTimeOutIsLeftRunning) {
-    pextest::TestMachine m;
-    Process p;
-    ASSERT_TRUE(plat::proc::Start("pextestprog sleep 60000", "", &p));
-    EXPECT_EQ(plat::proc::Wait(p, 30), WaitResult::TimedOut);
-    // There is no message queue to dispatch, but the time-out still holds.
-    EXPECT_EQ(plat::proc::WaitDispatching(p, 30, true), WaitResult::TimedOut);
-    std::uint32_t code = 0;
-    ASSERT_TRUE(plat::proc::ExitCode(p, &code));
-    EXPECT_EQ(code, plat::proc::kStillActive);
-
-    ASSERT_TRUE(plat::proc::Terminate(p, 1));
-    EXPECT_EQ(plat::proc::Wait(p, 0), WaitResult::Ended);
-    ASSERT_TRUE(plat::proc::ExitCode(p, &code));
-    EXPECT_EQ(code, 1u);
-}
-
 }  // namespace

@@ -5,9 +5,7 @@
 #include <string>
 
 #include "platform/cfile.h"
-#include "platform/files.h"
 #include "platform/library.h"
-#include "platform/version_info.h"
 #include "rivzip/rivzip.h"
 #include "tests/rivzip/memory_streams.h"
 #include "tests/support/test_machine.h"
@@ -67,14 +65,6 @@ TEST_F(RivzipModule, FileFailuresBecomeNegativeResultsNotExceptions) {
     machine_.WriteFile("C:\\dl\\out.exe", "");
     EXPECT_EQ(Run(expand_, "C:\\dl\\good.ex_", "C:\\dl\\x.exe", CFile::modeWrite | CFile::modeNoTruncate), kRivzipReadError);
     EXPECT_EQ(Run(expand_, "C:\\dl\\good.ex_", "C:\\dl\\out.exe", 0, CFile::modeRead), kRivzipWriteError);
-}
-
-TEST_F(RivzipModule, CarriesVersionInformation) {
-    plat::ver::VersionInfo info;
-    std::string description;
-    ASSERT_TRUE(plat::ver::Read(plat::files::ModuleFileName(reinterpret_cast<const void*>(expand_)), &info));
-    EXPECT_TRUE(info.QueryString("\\StringFileInfo\\040904E4\\FileDescription", &description));
-    EXPECT_EQ(description, "Vantric Rivzip Decompression Library");
 }
 
 }  // namespace
