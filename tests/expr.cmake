@@ -4,7 +4,7 @@ target_link_libraries(pex_expr_test_support PUBLIC pex_commands pex_expr pex_tes
                       GTest::gtest)
 pex_warnings(pex_expr_test_support)
 
-foreach(unit override_expression override_parser validation builtins execution_plan
+foreach(unit override_parser validation builtins execution_plan
              hostile_scripts)
   if(EXISTS ${CMAKE_CURRENT_SOURCE_DIR}/expr/${unit}_test.cpp)
     pex_add_test(expr_${unit}_test
