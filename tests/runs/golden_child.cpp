@@ -1,0 +1,88 @@
+#include "tests/runs/golden_child.h"
+
+#include <cstdlib>
+
+#ifndef _WIN32
+#include <sys/wait.h>
+#include <cerrno>
+#endif
+
+#include "diag/trace_log.h"
+#include "entry/library_startup.h"
+#include "entry/update_all.h"
+#include "manifest/manifest_parser.h"
+#include "platform/fault.h"
+#include "platform/files.h"
+#include "platform/machine.h"
+#include "platform/process.h"
+#include "tests/support/environment.h"
+
+namespace golden {
+
+namespace {
+
+const char* const kChildVariable = "PEX_GOLDEN_CHILD";  // "<crashAt> [product]"
+std::string* g_progress = nullptr;
+
+bool Record(CProgressData* p) {
+    if (!g_progress) return false;
+    *g_progress += "  " + std::to_string(p->CurrentStep) + "/" + std::to_string(p->TotalSteps) + " " +
+                   p->StatusText;
+    if (p->ItemTotalSet) *g_progress += " (" + std::to_string(p->ItemDone) + "/" + std::to_string(p->ItemTotal) + ")";
+    *g_progress += "\n";
+    return false;
+}
+
+std::string Call(const Run& run) {
+    if (run.product.empty()) return UpdateAll(&Record) ? "true" : "false";
+    CManifestParser parser;
+    return std::to_string(parser.ProcessUpdateInformation(_bstr_t(run.product.c_str()), &Record));
+}
+
+}  // namespace
+
+std::string RunHere(const Run& run, const std::string& modulePath, std::string* progress) {
+    g_progress = progress;
+    StartLibrary(modulePath);
+    const std::string result = Call(run);
+    StopLibrary();
+    g_progress = nullptr;
+    return result;
+}
+
+std::string RunCutOff(const Run& run, int crashAt, const std::string& modulePath) {
+    pextest::SetEnvironment(kChildVariable, std::to_string(crashAt) + " " + run.product);
+    pextest::SetEnvironment("PEX_MACHINE", plat::machine::Root());
+    plat::proc::Process child;
+    std::uint32_t code = 0;
+    const bool ran = plat::proc::Start("\"" + plat::files::ModuleFileName(nullptr) + "\"", "", &child) &&
+                     plat::proc::Wait(child, plat::proc::kInfinite) == plat::proc::WaitResult::Ended &&
+                     plat::proc::ExitCode(child, &code);
+    pextest::RemoveEnvironment(kChildVariable);
+    if (!ran) return "could not start";
+    if (code == plat::fault::kCrashExitCode) return "cut off";
+    return code == 0 ? "finished first" : "exit " + std::to_string(code);
+}
+
+bool IsChild() { return std::getenv(kChildVariable) != nullptr; }
+
+int ChildMain() {
+    const std::string spec = std::getenv(kChildVariable);
+    const auto blank = spec.find(' ');
+    plat::machine::Ensure();
+    plat::fault::CrashAtMutation(std::stoi(spec.substr(0, blank)));
+    g_TraceLog.enabled = false;
+    Call(Run{blank == std::string::npos ? "" : spec.substr(blank + 1)});
+    return 0;
+}
+
+bool ChildLeft() {
+#ifdef _WIN32
+    return false;  // processes started on Windows are checked by the Linux build
+#else
+    int status = 0;
+    return !(waitpid(-1, &status, WNOHANG) == -1 && errno == ECHILD);
+#endif
+}
+
+}  // namespace golden

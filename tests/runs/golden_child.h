@@ -1,0 +1,28 @@
+// How the golden-run driver runs the library: in its own process as a host that loaded
+// Mendler.dll, or in a child process that the fault plan ends before a chosen operation.
+#pragma once
+#include <string>
+
+namespace golden {
+
+struct Run {
+    std::string product;  // empty: UpdateAll over every product
+};
+
+// Starts the library as loading Mendler.dll at modulePath does, runs, stops it again; each
+// progress report is appended to *progress. Returns what the call returned.
+std::string RunHere(const Run& run, const std::string& modulePath, std::string* progress);
+
+// The run in a child process (this program again) that ends just before its crashAt-th
+// mutating operation, as a killed process would; it writes no trace, whose lines would count
+// as operations of their own. Returns how the child ended.
+std::string RunCutOff(const Run& run, int crashAt, const std::string& modulePath);
+
+// The child's side of RunCutOff.
+bool IsChild();
+int ChildMain();
+
+// True when this process has a child left running or not waited for.
+bool ChildLeft();
+
+}  // namespace golden
