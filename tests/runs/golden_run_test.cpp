@@ -180,7 +180,7 @@ private:
 
     std::unique_ptr<plat::CFile> Hold(const std::string& path) {
         auto file = std::make_unique<plat::CFile>();
-        EXPECT_TRUE(file->Open(path, plat::CFile::modeRead | plat::CFile::shareExclusive)) << path;
+        EXPECT_TRUE(file->Open(path, plat::CFile::modeRead | plat::CFile::shareDenyWrite)) << path;
         return file;
     }
 
@@ -221,7 +221,7 @@ private:
         std::string bin = std::regex_replace(binFolder_, std::regex("[\\\\^$.|?*+()\\[\\]{}]"), "\\$&");
         out = std::regex_replace(out, std::regex("\\[ *" + bin, std::regex::icase), "[<bin>\\");
         out = std::regex_replace(out, std::regex(bin, std::regex::icase), "<bin>\\");
-        return std::regex_replace(out, std::regex("\\b[A-Za-z$~]{0,3}[0-9A-F]{4}\\.tmp\\b"), "<unique>.tmp");
+        return std::regex_replace(out, std::regex("\\b[A-Za-z$~]{0,3}[0-9A-Fa-f]{4}\\.tmp\\b"), "<unique>.tmp");
     }
 
     // Every file on drive C: below the folders that a fresh machine does not have.
