@@ -123,6 +123,7 @@ public:
         PrepareMachine();
         const std::vector<std::string> temp = Names(plat::files::TempFolder());
         std::vector<std::unique_ptr<plat::CFile>> held;
+        std::unique_ptr<golden::LockHolder> lock;
         std::istringstream script(Slurp(folder_ / "scenario.txt"));
         for (std::string line; std::getline(script, line);) {
             const auto w = Words(line);
@@ -130,12 +131,14 @@ public:
             if (w[0] == "hold") held.push_back(Hold(line.substr(line.find(w[1]))));
             else if (w[0] == "fault") Fault(w);
             else if (w[0] == "crash") crashAt_ = std::stoi(w.at(1));
+            else if (w[0] == "lock") lock = std::make_unique<golden::LockHolder>();
             else if (w[0] == "run") Run(w, line);
             else ADD_FAILURE() << "unknown directive: " << line;
         }
         EXPECT_EQ(OpenHandles(), handles_) << "a run left a file handle open";
         EXPECT_FALSE(golden::ChildLeft()) << "a run left a child process";
         held.clear();
+        lock.reset();
         plat::fault::Clear();
         EXPECT_EQ(Names(plat::files::TempFolder()), temp) << "a run left a temporary file";
         Compare("trace.log", trace_);
@@ -197,7 +200,7 @@ private:
 
     // One run: the host's UpdateAll (as Mendler.dll does when a host loads it) or one product.
     void Run(const std::vector<std::string>& w, const std::string& line) {
-        golden::Run run{w.size() > 2 ? w[2] : ""};
+        golden::Run run{w.size() > 2 && w[1] == "product" ? w[2] : "", w.back() == "nested"};
         if (crashAt_ > 0) {
             progress_ += line + ": cut off before its mutating operation " + std::to_string(crashAt_) + ": " +
                          golden::RunCutOff(run, crashAt_) + "\n";
