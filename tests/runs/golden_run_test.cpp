@@ -61,6 +61,10 @@ std::vector<std::string> Lines(const std::string& text) {
     return out;
 }
 
+bool EndsWith(const std::string& text, const std::string& end) {
+    return text.size() >= end.size() && text.compare(text.size() - end.size(), end.size(), end) == 0;
+}
+
 std::string Backslashed(std::string path) {
     std::replace(path.begin(), path.end(), '/', '\\');
     return path;
@@ -252,6 +256,10 @@ private:
             lines->push_back(path + " (trace log)");
             return;
         }
+        if (EndsWith(path, "$jnl$")) {  // its records carry the file times of the targets it backs up
+            lines->push_back(path + " " + std::to_string(status.size) + " (journal)");
+            return;
+        }
         std::string bytes;
         plat::files::ReadAll(path, &bytes);
         lines->push_back(path + " " + std::to_string(status.size) + " " + Sha256(bytes) +
@@ -310,7 +318,7 @@ private:
             const std::string name = path.substr(path.rfind('\\') + 1);
             std::string lower = name;
             std::transform(lower.begin(), lower.end(), lower.begin(), ::tolower);
-            if (lower.find("content") == std::string::npos) continue;
+            if (lower.find("content") == std::string::npos || EndsWith(name, "$jnl$")) continue;
             std::string bytes;
             plat::files::ReadAll(path, &bytes);
             Compare("content/" + name, bytes);
