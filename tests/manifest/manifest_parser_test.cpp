@@ -5,7 +5,6 @@
 
 #include <gtest/gtest.h>
 
-#include <array>
 
 #include "platform/errors.h"
 #include "platform/files.h"
@@ -43,23 +42,6 @@ protected:
     pextest::TraceCapture trace;
     CManifestParser parser;
 };
-
-TEST_F(ManifestParser, SiteIsSplitIntoHostAndPath) {
-    const std::vector<std::array<std::string, 3>> cases = {
-        {"server1/pub/files", "server1/", "pub/files/"},
-        {"server2", "server2/", ""},
-        {"/pub", "", "pub/"},
-        {"host\\dir\\", "host/", "dir/"},
-        {"", "", ""},
-    };
-    for (const auto& c : cases) {
-        Set(kSection, "Site", c[0]);
-        CManifestParser settings;
-        settings.Init("Zendor32");
-        EXPECT_EQ(settings.Site(), c[1]) << c[0];
-        EXPECT_EQ(settings.FtpPath(), c[2]) << c[0];
-    }
-}
 
 TEST_F(ManifestParser, BranchesComeFromTheSitesApplicationProfile) {
     Set(kSection, "Site", "server1/pub");

@@ -161,7 +161,6 @@ public:
 
 private:
     void PrepareMachine() {
-        std::string error;
         plat::reg::RegFileError regError;
         ASSERT_EQ(plat::reg::ImportRegFile(Slurp(folder_ / "machine.reg"), &regError), 0)
             << "machine.reg line " << regError.line << ": " << regError.message;
