@@ -4,6 +4,7 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <cstdio>
 #include <cstdlib>
 #include <ctime>
 #include <filesystem>
@@ -382,9 +383,24 @@ private:
 
 }  // namespace
 
+// The scenario's own process prints only what failed, so that the program's output keeps one
+// summary (the Windows test runner reads its counts from it).
+class FailurePrinter : public ::testing::EmptyTestEventListener {
+    void OnTestPartResult(const ::testing::TestPartResult& result) override {
+        if (result.failed())
+            std::printf("%s:%d: Failure\n%s\n", result.file_name() ? result.file_name() : "?", result.line_number(),
+                        result.message());
+    }
+};
+
 int main(int argc, char** argv) {
     if (golden::IsChild()) return golden::ChildMain();
     ::testing::InitGoogleTest(&argc, argv);
+    if (golden::IsScenarioProcess()) {
+        ::testing::TestEventListeners& listeners = ::testing::UnitTest::GetInstance()->listeners();
+        delete listeners.Release(listeners.default_result_printer());
+        listeners.Append(new FailurePrinter);
+    }
     std::vector<fs::path> folders;
     for (const auto& e : fs::directory_iterator(PEX_RUNS_DIR))
         if (fs::exists(e.path() / "scenario.txt")) folders.push_back(e.path());
