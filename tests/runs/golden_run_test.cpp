@@ -235,6 +235,9 @@ private:
         const std::string bin = Escaped(binFolder_);
         out = std::regex_replace(out, std::regex("\\[ *" + bin, std::regex::icase), "[<bin>\\");
         out = std::regex_replace(out, std::regex(bin, std::regex::icase), "<bin>\\");
+        // The banner looks for pexupdate.exe beside the library: the Windows build has it, stamped
+        // with the suite's version; the Linux build's host program is "pexupdate".
+        out = std::regex_replace(out, std::regex("(\\[<bin>\\\\pexupdate\\.exe\\]: ).*"), "$1(the build's own)");
         out = std::regex_replace(out, std::regex(Escaped(plat::files::TempFolder()), std::regex::icase), "<temp>\\");
         return std::regex_replace(out, std::regex("\\b[A-Za-z$~]{0,3}[0-9A-Fa-f]{4}\\.tmp\\b"), "<unique>.tmp");
     }
