@@ -22,6 +22,7 @@ namespace golden {
 namespace {
 
 const char* const kChildVariable = "PEX_GOLDEN_CHILD";  // "<crashAt> [product]"
+const char* const kScenarioVariable = "PEX_GOLDEN_SCENARIO";
 std::string* g_progress = nullptr;
 
 bool Record(CProgressData* p) {
@@ -50,16 +51,31 @@ std::string RunHere(const Run& run, const std::string& modulePath, std::string* 
     return result;
 }
 
-std::string RunCutOff(const Run& run, int crashAt, const std::string& modulePath) {
-    pextest::SetEnvironment(kChildVariable, std::to_string(crashAt) + " " + run.product);
-    pextest::SetEnvironment("PEX_MACHINE", plat::machine::Root());
+// This program again with the arguments; its exit code, or -1 when it could not be run.
+int RunSelf(const std::string& arguments) {
     plat::proc::Process child;
     std::uint32_t code = 0;
-    const bool ran = plat::proc::Start("\"" + plat::files::ModuleFileName(nullptr) + "\"", "", &child) &&
+    const bool ran = plat::proc::Start("\"" + plat::files::ModuleFileName(nullptr) + "\"" + arguments, "", &child) &&
                      plat::proc::Wait(child, plat::proc::kInfinite) == plat::proc::WaitResult::Ended &&
                      plat::proc::ExitCode(child, &code);
+    return ran ? static_cast<int>(code) : -1;
+}
+
+int RunScenarioAlone(const std::string& testName) {
+    pextest::SetEnvironment(kScenarioVariable, "1");
+    const int code = RunSelf(" --gtest_filter=" + testName);
+    pextest::RemoveEnvironment(kScenarioVariable);
+    return code;
+}
+
+bool IsScenarioProcess() { return std::getenv(kScenarioVariable) != nullptr; }
+
+std::string RunCutOff(const Run& run, int crashAt) {
+    pextest::SetEnvironment(kChildVariable, std::to_string(crashAt) + " " + run.product);
+    pextest::SetEnvironment("PEX_MACHINE", plat::machine::Root());
+    const int code = RunSelf("");
     pextest::RemoveEnvironment(kChildVariable);
-    if (!ran) return "could not start";
+    if (code < 0) return "could not start";
     if (code == plat::fault::kCrashExitCode) return "cut off";
     return code == 0 ? "finished first" : "exit " + std::to_string(code);
 }

@@ -16,7 +16,14 @@ std::string RunHere(const Run& run, const std::string& modulePath, std::string* 
 // The run in a child process (this program again) that ends just before its crashAt-th
 // mutating operation, as a killed process would; it writes no trace, whose lines would count
 // as operations of their own. Returns how the child ended.
-std::string RunCutOff(const Run& run, int crashAt, const std::string& modulePath);
+std::string RunCutOff(const Run& run, int crashAt);
+
+// Runs one scenario test of this program in a process of its own, so that it starts from a
+// freshly loaded library as a host does (the decompressor and the progress record live as long
+// as the process). Returns the child's exit code; what it finds is in its own output.
+int RunScenarioAlone(const std::string& testName);
+// True in that process.
+bool IsScenarioProcess();
 
 // The child's side of RunCutOff.
 bool IsChild();
