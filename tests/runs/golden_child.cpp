@@ -1,6 +1,8 @@
 #include "tests/runs/golden_child.h"
 
 #include <cstdlib>
+#include <future>
+#include <thread>
 
 #ifndef _WIN32
 #include <sys/wait.h>
@@ -9,11 +11,13 @@
 
 #include "diag/trace_log.h"
 #include "entry/library_startup.h"
+#include "entry/run_guard.h"
 #include "entry/update_all.h"
 #include "manifest/manifest_parser.h"
 #include "platform/fault.h"
 #include "platform/files.h"
 #include "platform/machine.h"
+#include "platform/machine_lock.h"
 #include "platform/process.h"
 #include "tests/support/environment.h"
 
@@ -24,9 +28,17 @@ namespace {
 const char* const kChildVariable = "PEX_GOLDEN_CHILD";  // "<crashAt> [product]"
 const char* const kScenarioVariable = "PEX_GOLDEN_SCENARIO";
 std::string* g_progress = nullptr;
+Run g_run;  // the run in progress
 
 bool Record(CProgressData* p) {
     if (!g_progress) return false;
+    if (g_run.nested) {  // a host that calls again from its callback
+        g_run.nested = false;
+        *g_progress += "  nested UpdateAll returned " + std::string(UpdateAll(nullptr) ? "true" : "false") + "\n";
+        CManifestParser parser;
+        *g_progress += "  nested product run returned " +
+                       std::to_string(parser.ProcessUpdateInformation(_bstr_t("Zendor32"), nullptr)) + "\n";
+    }
     *g_progress += "  " + std::to_string(p->CurrentStep) + "/" + std::to_string(p->TotalSteps) + " " +
                    p->StatusText;
     if (p->ItemTotalSet) *g_progress += " (" + std::to_string(p->ItemDone) + "/" + std::to_string(p->ItemTotal) + ")";
@@ -35,6 +47,7 @@ bool Record(CProgressData* p) {
 }
 
 std::string Call(const Run& run) {
+    g_run = run;
     if (run.product.empty()) return UpdateAll(&Record) ? "true" : "false";
     CManifestParser parser;
     return std::to_string(parser.ProcessUpdateInformation(_bstr_t(run.product.c_str()), &Record));
@@ -90,6 +103,28 @@ int ChildMain() {
     g_TraceLog.enabled = false;
     Call(Run{blank == std::string::npos ? "" : spec.substr(blank + 1)});
     return 0;
+}
+
+struct LockHolder::State {
+    std::promise<void> held, release;
+    std::thread thread;
+};
+
+LockHolder::LockHolder() : state_(new State) {
+    plat::SetMachineLockWaitCap(0);
+    state_->thread = std::thread([state = state_.get(), done = state_->release.get_future()]() mutable {
+        plat::MachineLock lock(kProductRunLockName);
+        lock.Acquire(0);
+        state->held.set_value();
+        done.wait();
+    });
+    state_->held.get_future().wait();
+}
+
+LockHolder::~LockHolder() {
+    state_->release.set_value();
+    state_->thread.join();
+    plat::SetMachineLockWaitCap(plat::kNoMachineLockWaitCap);
 }
 
 bool ChildLeft() {

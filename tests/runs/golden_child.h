@@ -1,12 +1,27 @@
 // How the golden-run driver runs the library: in its own process as a host that loaded
 // Mendler.dll, or in a child process that the fault plan ends before a chosen operation.
 #pragma once
+#include <memory>
 #include <string>
 
 namespace golden {
 
 struct Run {
     std::string product;  // empty: UpdateAll over every product
+    bool nested = false;  // the callback's first report calls UpdateAll and the product run again
+};
+
+// Another process's product run holds the machine's update lock while this object lives (a
+// thread of this process holds it, which on both targets counts as another holder), and a run
+// waits no time for it.
+class LockHolder {
+public:
+    LockHolder();
+    ~LockHolder();
+
+private:
+    struct State;
+    std::unique_ptr<State> state_;
 };
 
 // Starts the library as loading Mendler.dll at modulePath does, runs, stops it again; each

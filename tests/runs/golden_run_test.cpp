@@ -61,6 +61,10 @@ std::vector<std::string> Lines(const std::string& text) {
     return out;
 }
 
+bool EndsWith(const std::string& text, const std::string& end) {
+    return text.size() >= end.size() && text.compare(text.size() - end.size(), end.size(), end) == 0;
+}
+
 std::string Backslashed(std::string path) {
     std::replace(path.begin(), path.end(), '/', '\\');
     return path;
@@ -123,6 +127,7 @@ public:
         PrepareMachine();
         const std::vector<std::string> temp = Names(plat::files::TempFolder());
         std::vector<std::unique_ptr<plat::CFile>> held;
+        std::unique_ptr<golden::LockHolder> lock;
         std::istringstream script(Slurp(folder_ / "scenario.txt"));
         for (std::string line; std::getline(script, line);) {
             const auto w = Words(line);
@@ -130,12 +135,14 @@ public:
             if (w[0] == "hold") held.push_back(Hold(line.substr(line.find(w[1]))));
             else if (w[0] == "fault") Fault(w);
             else if (w[0] == "crash") crashAt_ = std::stoi(w.at(1));
+            else if (w[0] == "lock") lock = std::make_unique<golden::LockHolder>();
             else if (w[0] == "run") Run(w, line);
             else ADD_FAILURE() << "unknown directive: " << line;
         }
         EXPECT_EQ(OpenHandles(), handles_) << "a run left a file handle open";
         EXPECT_FALSE(golden::ChildLeft()) << "a run left a child process";
         held.clear();
+        lock.reset();
         plat::fault::Clear();
         EXPECT_EQ(Names(plat::files::TempFolder()), temp) << "a run left a temporary file";
         Compare("trace.log", trace_);
@@ -180,7 +187,7 @@ private:
 
     std::unique_ptr<plat::CFile> Hold(const std::string& path) {
         auto file = std::make_unique<plat::CFile>();
-        EXPECT_TRUE(file->Open(path, plat::CFile::modeRead | plat::CFile::shareExclusive)) << path;
+        EXPECT_TRUE(file->Open(path, plat::CFile::modeRead | plat::CFile::shareDenyWrite)) << path;
         return file;
     }
 
@@ -197,7 +204,7 @@ private:
 
     // One run: the host's UpdateAll (as Mendler.dll does when a host loads it) or one product.
     void Run(const std::vector<std::string>& w, const std::string& line) {
-        golden::Run run{w.size() > 2 ? w[2] : ""};
+        golden::Run run{w.size() > 2 && w[1] == "product" ? w[2] : "", w.back() == "nested"};
         if (crashAt_ > 0) {
             progress_ += line + ": cut off before its mutating operation " + std::to_string(crashAt_) + ": " +
                          golden::RunCutOff(run, crashAt_) + "\n";
@@ -221,7 +228,7 @@ private:
         std::string bin = std::regex_replace(binFolder_, std::regex("[\\\\^$.|?*+()\\[\\]{}]"), "\\$&");
         out = std::regex_replace(out, std::regex("\\[ *" + bin, std::regex::icase), "[<bin>\\");
         out = std::regex_replace(out, std::regex(bin, std::regex::icase), "<bin>\\");
-        return std::regex_replace(out, std::regex("\\b[A-Za-z$~]{0,3}[0-9A-F]{4}\\.tmp\\b"), "<unique>.tmp");
+        return std::regex_replace(out, std::regex("\\b[A-Za-z$~]{0,3}[0-9A-Fa-f]{4}\\.tmp\\b"), "<unique>.tmp");
     }
 
     // Every file on drive C: below the folders that a fresh machine does not have.
@@ -247,6 +254,10 @@ private:
         if (path.find("\\.pex~") != std::string::npos) return;
         if (path.rfind(kLogFolder, 0) == 0) {  // its bytes are the trace log, compared above
             lines->push_back(path + " (trace log)");
+            return;
+        }
+        if (EndsWith(path, "$jnl$")) {  // its records carry the file times of the targets it backs up
+            lines->push_back(path + " " + std::to_string(status.size) + " (journal)");
             return;
         }
         std::string bytes;
@@ -307,7 +318,7 @@ private:
             const std::string name = path.substr(path.rfind('\\') + 1);
             std::string lower = name;
             std::transform(lower.begin(), lower.end(), lower.begin(), ::tolower);
-            if (lower.find("content") == std::string::npos) continue;
+            if (lower.find("content") == std::string::npos || EndsWith(name, "$jnl$")) continue;
             std::string bytes;
             plat::files::ReadAll(path, &bytes);
             Compare("content/" + name, bytes);
