@@ -30,6 +30,7 @@
 #include "platform/reg_file.h"
 #include "platform/setup_install.h"
 #include "tests/runs/golden_child.h"
+#include "tests/support/platform_guard.h"
 #include "tests/support/test_machine.h"
 
 namespace fs = std::filesystem;
@@ -60,6 +61,11 @@ std::vector<std::string> Lines(const std::string& text) {
     std::vector<std::string> out;
     for (std::string line; std::getline(in, line);) out.push_back(line);
     return out;
+}
+
+// The text as a regular expression that matches it literally.
+std::string Escaped(const std::string& text) {
+    return std::regex_replace(text, std::regex("[\\\\^$.|?*+()\\[\\]{}]"), "\\$&");
 }
 
 bool EndsWith(const std::string& text, const std::string& end) {
@@ -126,7 +132,7 @@ public:
         const plat::paths::PathParts bin = plat::paths::SplitPath(plat::lib::SearchFile("Mendler.dll"));
         binFolder_ = bin.drive + bin.dir;
         PrepareMachine();
-        const std::vector<std::string> temp = Names(plat::files::TempFolder());
+        const std::vector<std::string> temp = LeftInTemp();
         std::vector<std::unique_ptr<plat::CFile>> held;
         std::unique_ptr<golden::LockHolder> lock;
         std::istringstream script(Slurp(folder_ / "scenario.txt"));
@@ -147,7 +153,7 @@ public:
         lock.reset();
         for (const std::string& path : modules_) EXPECT_TRUE(plat::files::Remove(path)) << path;
         plat::fault::Clear();
-        EXPECT_EQ(Names(plat::files::TempFolder()), temp) << "a run left a temporary file";
+        EXPECT_EQ(LeftInTemp(), temp) << "a run left a temporary file";
         Compare("trace.log", trace_);
         Compare("progress.txt", progress_);
         Compare("files.txt", Files());
@@ -227,7 +233,8 @@ private:
         progress_ += line + "\n";
         const std::string result = golden::RunHere(run, kModule, &progress_);
         progress_ += "returned " + result + "\n";
-        trace_ += "#### " + line + "\n" + Normalised(Slurp(plat::paths::ToHost(kLog)), true);
+        // The support snapshot lists registry values too.
+        trace_ += "#### " + line + "\n" + SortedValues(Normalised(Slurp(plat::paths::ToHost(kLog)), true));
     }
 
     // Time stamps, the build's own folder and temporary names differ from machine to machine.
@@ -237,9 +244,10 @@ private:
                               : text;
         out = std::regex_replace(out, std::regex("\r\n"), "\n");
         // The banner pads each module path to a width: the build folder's length varies.
-        std::string bin = std::regex_replace(binFolder_, std::regex("[\\\\^$.|?*+()\\[\\]{}]"), "\\$&");
+        const std::string bin = Escaped(binFolder_);
         out = std::regex_replace(out, std::regex("\\[ *" + bin, std::regex::icase), "[<bin>\\");
         out = std::regex_replace(out, std::regex(bin, std::regex::icase), "<bin>\\");
+        out = std::regex_replace(out, std::regex(Escaped(plat::files::TempFolder()), std::regex::icase), "<temp>\\");
         return std::regex_replace(out, std::regex("\\b[A-Za-z$~]{0,3}[0-9A-Fa-f]{4}\\.tmp\\b"), "<unique>.tmp");
     }
 
@@ -310,6 +318,20 @@ private:
         return out;
     }
 
+    // The temporary folder's files, but those that the restart queue moves (Wine stages the
+    // files it queues there).
+    static std::vector<std::string> LeftInTemp() {
+        std::vector<plat::setup::PendingRename> queue;
+        plat::setup::ReadPendingRenames(&queue);
+        std::vector<std::string> names;
+        for (const std::string& name : Names(plat::files::TempFolder())) {
+            const std::string path = plat::files::TempFolder() + name;
+            if (std::none_of(queue.begin(), queue.end(), [&](const auto& op) { return op.from == path; }))
+                names.push_back(name);
+        }
+        return names;
+    }
+
     std::string RestartQueue() const {
         std::vector<plat::setup::PendingRename> queue;
         if (!plat::setup::ReadPendingRenames(&queue)) return "(queue unreadable)\n";
@@ -322,7 +344,7 @@ private:
     // The content files after the run (any file whose name has "content"), byte for byte.
     void CompareContentFiles() const {
         const fs::path kept = folder_ / "expected" / "content";
-        if (std::getenv("PEX_ACCEPT")) fs::remove_all(kept);
+        if (std::getenv("PEX_ACCEPT") && !pextest::UnderWine()) fs::remove_all(kept);
         std::vector<std::string> names;
         std::istringstream list(Files());
         for (std::string line; std::getline(list, line);) {
@@ -342,8 +364,13 @@ private:
                 ADD_FAILURE() << "content file " << e.path().filename() << " is no longer left";
     }
 
+    // Where Wine does what Windows would not, a scenario keeps what Wine does in expected/wine/
+    // (its scenario.txt says why); accepting under Wine writes only what differs.
     void Compare(const std::string& name, const std::string& actual) const {
-        const fs::path file = folder_ / "expected" / name;
+        fs::path file = folder_ / "expected" / name;
+        const fs::path wine = folder_ / "expected" / "wine" / name;
+        if (pextest::UnderWine() && (fs::exists(wine) || (std::getenv("PEX_ACCEPT") && Slurp(file) != actual)))
+            file = wine;
         if (std::getenv("PEX_ACCEPT")) {
             fs::create_directories(file.parent_path());
             std::ofstream(file, std::ios::binary) << actual;
