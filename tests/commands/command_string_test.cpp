@@ -56,40 +56,4 @@ TEST_F(CommandStringTest, EveryTagReachesItsExecutorWithTheTrimmedParameter) {
                      "DelIfExists(h)", "RegSvr(i)", "Registry(j)", "Run()", "Del(IFEXISTS] m)"}));
 }
 
-// Unknown items are skipped silently; TRY- commands let the list go on, but the result is false.
-TEST_F(CommandStringTest, TracesEveryItemAndTryCommandsContinue) {
-    EXPECT_TRUE(commands.Execute("[run] one;; [NOPE] two ; \n"));
-    EXPECT_FALSE(commands.Execute("[TRY-REGSVR] text;[try-del] file;[DEL] next"));
-    EXPECT_EQ(commands.calls, (Lines{"Run(one)", "RegSvr(text)", "Del(file)", "Del(next)"}));
-    EXPECT_EQ(trace.Lines(), (Lines{
-        "CommandString::Execute 3 items in command list",
-        "CommandString::Execute, command is [run] one",
-        "Command [[RUN]] Complete.",
-        "CommandString::Execute, command is ",
-        "CommandString::Execute, command is [NOPE] two",
-        "CommandString::Execute returning 1",
-        "CommandString::Execute 3 items in command list",
-        "CommandString::Execute, command is [TRY-REGSVR] text",
-        "Ignoring Exception [boom] from Command [[TRY-REGSVR]].",
-        "CommandString::Execute, command is [try-del] file",
-        "Ignoring unknown Exception from Command [[TRY-DEL]].",
-        "CommandString::Execute, command is [DEL] next",
-        "Command [[DEL]] Complete.",
-        "CommandString::Execute returning 0",
-    }));
-}
-
-TEST_F(CommandStringTest, AFailingCommandWithoutTryStopsTheListAndRethrows) {
-    try {
-        commands.Execute("[REGISTRY] text;[RUN] never");
-        FAIL() << "no exception";
-    } catch (const char* message) {
-        EXPECT_EQ(message, RecordingCommands::kMessage);  // the same object, not a copy
-    }
-    EXPECT_EQ(trace.Lines().back(), "Throwing Exception [boom] from Command [[REGISTRY]].");
-    EXPECT_THROW(commands.Execute("[delifexists] file;[RUN] never"), plat::CFileException);
-    EXPECT_EQ(commands.calls, (Lines{"Registry(text)", "DelIfExists(file)"}));
-    EXPECT_EQ(trace.Lines().back(), "Throwing unknown Exception from Command [[DELIFEXISTS]].");
-}
-
 }  // namespace

@@ -201,21 +201,6 @@ TEST_F(InPlaceExpansion, CodesWithoutExpansion) {
     }
 }
 
-TEST_F(InPlaceExpansion, LzwThroughTheLibrary) {
-    const std::string original = Sample(3 << 20);
-    EXPECT_TRUE(Expand(kCompressionLZW, Szdd(original), &Note));
-    EXPECT_EQ(machine_.ReadFile(kPath), original);
-    const std::string p = "CDecompressionObjects::DecompressLZW, ";
-    EXPECT_EQ(trace_.Lines(), (Lines{"CDecompressionObjects::Decompress, file is C:\\dl\\app.exe",
-                                     p + "file is C:\\dl\\app.exe", p + "open of 'C:\\dl\\app.exe' successfull",
-                                     p + "open of 'C:\\dl\\app.exe.$new$' successfull", p + "Decompress succeeded",
-                                     p + "'C:\\dl\\app.exe' replaced by its expansion", p + "returning 1",
-                                     "CDecompressionObjects::Decompress, returning 1"}));
-    EXPECT_FALSE(plat::files::Exists(kStaging));
-    EXPECT_TRUE(IsRecordedExpansion(kPath)) << "until the content file says the download is expanded";
-    EXPECT_EQ(lastReport.ItemDone, static_cast<std::int32_t>(original.size() >> 3));
-}
-
 TEST_F(InPlaceExpansion, ZlibAndGzipStreams) {
     const std::string original = Sample(300000);
     for (int format : {kZlib, kGzip}) {

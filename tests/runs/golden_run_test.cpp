@@ -16,6 +16,7 @@
 #include <string>
 #include <vector>
 
+#include "commands/platform_utilities.h"
 #include "diag/trace_log.h"
 #include "entry/library_startup.h"
 #include "entry/update_all.h"
@@ -143,6 +144,7 @@ public:
             else if (w[0] == "fault") Fault(w);
             else if (w[0] == "crash") crashAt_ = std::stoi(w.at(1));
             else if (w[0] == "lock") lock = std::make_unique<golden::LockHolder>();
+            else if (w[0] == "module") PlaceModule(w.at(1), line.substr(line.find(w.at(2))));
             else if (w[0] == "run") Run(w, line);
             else ADD_FAILURE() << "unknown directive: " << line;
         }
@@ -150,6 +152,7 @@ public:
         EXPECT_FALSE(golden::ChildLeft()) << "a run left a child process";
         held.clear();
         lock.reset();
+        for (const std::string& path : modules_) EXPECT_TRUE(plat::files::Remove(path)) << path;
         plat::fault::Clear();
         EXPECT_EQ(LeftInTemp(), temp) << "a run left a temporary file";
         Compare("trace.log", trace_);
@@ -189,6 +192,15 @@ private:
         }
         // A time after this one came from the clock (a day back, for file systems that round).
         clock_ = (static_cast<plat::files::FileTime>(std::time(nullptr)) + 11644473600ULL - 86400) * 10000000;
+    }
+
+    // A module of the build (its bytes differ per build and platform, so it is taken away again
+    // before the files are listed).
+    void PlaceModule(const std::string& name, const std::string& path) {
+        const plat::paths::PathParts parts = plat::paths::SplitPath(path);
+        CreateDirectoryTree(parts.drive + parts.dir);
+        EXPECT_TRUE(plat::files::Copy(binFolder_ + name, path, false)) << name << " to " << path;
+        modules_.push_back(path);
     }
 
     std::unique_ptr<plat::CFile> Hold(const std::string& path) {
@@ -378,6 +390,7 @@ private:
     std::unique_ptr<pextest::TestMachine> machine_;
     std::vector<std::string> baseline_;
     std::string binFolder_;
+    std::vector<std::string> modules_;
     plat::files::FileTime clock_ = 0;
     int crashAt_ = 0;
     int handles_ = -1;
