@@ -96,12 +96,12 @@ std::string RunCutOff(const Run& run, int crashAt) {
 bool IsChild() { return std::getenv(kChildVariable) != nullptr; }
 
 int ChildMain() {
-    const std::string spec = std::getenv(kChildVariable);
-    const auto blank = spec.find(' ');
+    const std::string request = std::getenv(kChildVariable);
+    const auto blank = request.find(' ');
     plat::machine::Ensure();
-    plat::fault::CrashAtMutation(std::stoi(spec.substr(0, blank)));
+    plat::fault::CrashAtMutation(std::stoi(request.substr(0, blank)));
     g_TraceLog.enabled = false;
-    Call(Run{blank == std::string::npos ? "" : spec.substr(blank + 1)});
+    Call(Run{blank == std::string::npos ? "" : request.substr(blank + 1)});
     return 0;
 }
 
