@@ -9,8 +9,6 @@ if(TARGET pex_decompress AND TARGET Rivzip)
     SOURCES ${CMAKE_CURRENT_SOURCE_DIR}/decompress/dispatcher_test.cpp
     LIBS pex_decompress rivzip_codec)
   set_target_properties(decompress_test PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${CMAKE_CURRENT_BINARY_DIR}/decompress)
-  # PexNoVersion (tests/platform_system.cmake) stands for a library without the expand entry.
-  target_compile_definitions(decompress_test PRIVATE
-    PEX_RIVZIP_DLL="$<TARGET_FILE:Rivzip>" PEX_MODULE_WITHOUT_ENTRY="$<TARGET_FILE:PexNoVersion>")
-  add_dependencies(decompress_test Rivzip PexNoVersion)
+  target_compile_definitions(decompress_test PRIVATE PEX_RIVZIP_DLL="$<TARGET_FILE:Rivzip>")
+  add_dependencies(decompress_test Rivzip)
 endif()

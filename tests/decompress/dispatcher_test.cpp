@@ -28,9 +28,8 @@ namespace {
 
 using Lines = std::vector<std::string>;
 
-// The built Rivzip.dll and a module that lacks its entry (set by tests/decompress.cmake).
+// The built Rivzip.dll (set by tests/decompress.cmake).
 constexpr char kRivzipModule[] = PEX_RIVZIP_DLL;
-constexpr char kModuleWithoutEntry[] = PEX_MODULE_WITHOUT_ENTRY;
 
 class DecompressTest : public ::testing::Test {
 protected:
@@ -104,21 +103,6 @@ TEST_F(LibraryLocation, TheRegistryValueNamesTheFolderWhenItIsText) {
     EXPECT_EQ(trace_.Lines(), (Lines{kInit, kReg, kReg + ", Unable to access registry, RegQueryValueEx returns 0",
                                      kPath1, kPath2, kFound}));
     EXPECT_EQ(CDecompressionObjects::LoadedFrom(), kFolder2 + "Rivzip.dll");
-}
-
-TEST_F(LibraryLocation, ALibraryWithoutTheEntryStaysLoadedAndEveryLzwExpansionFails) {
-    Place(kModuleWithoutEntry, kFolder1 + "Rivzip.dll");
-    machine_.WriteFile("C:\\app.ex_", "SZDD data");
-    CDecompressionObjects dispatcher;
-    EXPECT_TRUE(trace_.Contains("CDecompressionObjects::Load, no decompress function found for LZW"));
-    trace_.Clear();
-    EXPECT_FALSE(dispatcher.DecompressLZW("C:\\app.ex_", nullptr));
-    EXPECT_FALSE(dispatcher.DecompressLZW("C:\\app.ex_", nullptr));
-    const std::string one = "CDecompressionObjects::DecompressLZW, file is C:\\app.ex_\n"
-                            "CDecompressionObjects::DecompressLZW, no function pointer for this decompress type\n"
-                            "CDecompressionObjects::DecompressLZW, returning 0\n";
-    EXPECT_EQ(trace_.Text(), one + one) << "loaded already: no second attempt";
-    EXPECT_EQ(machine_.ReadFile("C:\\app.ex_"), "SZDD data");
 }
 
 constexpr char kPath[] = "C:\\dl\\app.exe";

@@ -43,17 +43,6 @@ TEST_F(SnapshotTest, EachLoadStartsAFreshLogWithTheBanner) {
     g_TraceLog.SetFileName("");
 }
 
-TEST_F(SnapshotTest, ComponentsWithoutFilesShowNoVersion) {
-    pextest::TraceCapture trace;
-    LogComponentVersions();
-    const auto lines = trace.Lines();
-    ASSERT_EQ(lines.size(), SuiteComponentList().size());
-    EXPECT_EQ(lines.back(), "ProgID: [     Brindle.Zendor32.Branding] File [" + std::string(40, ' ') +
-                                "]: Version # Not Available");
-    EXPECT_EQ(lines.front().rfind("File Version [", 0), 0u);
-    EXPECT_NE(lines.front().find("Mendler.DLL]: "), std::string::npos);
-}
-
 TEST_F(SnapshotTest, RegistryKeysAreDumpedOrReported) {
     pextest::SetRegValue(reg::kLocalMachine, "Software\\Vantric\\Pex", "Blob", reg::kRegBinary, "\x01");
     pextest::TraceCapture trace;
