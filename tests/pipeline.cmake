@@ -8,7 +8,3 @@ pex_add_test(pipeline_apply_test
   LIBS mendler_core rivzip_codec ZLIB::ZLIB)
 add_dependencies(pipeline_apply_test Rivzip)
 
-pex_add_test(pipeline_none_download_type_test
-  SOURCES ${CMAKE_CURRENT_SOURCE_DIR}/pipeline/pipeline_fixture.cpp
-          ${CMAKE_CURRENT_SOURCE_DIR}/pipeline/none_download_type_test.cpp
-  LIBS mendler_core)

@@ -1,4 +1,4 @@
-// The content table: loading CSV text, access by column name, rendering, saving, and the
+// The content table: loading CSV text, access by column name, saving, and the
 // upgrade statuses recorded in it.
 #include "manifest/content_table.h"
 
@@ -132,16 +132,6 @@ TEST(ContentTableAccess, ColumnsByNameAndCellsOutsideTheTable) {
     EXPECT_FALSE(table.SetField(0, "Command", "x"));
     EXPECT_TRUE(table.SetField(0, "upgradeSTATUS", "y"));
     EXPECT_EQ("FileName|UpgradeStatus|FILENAME;f|y|g", Dump(table));
-}
-
-TEST(ContentTableText, RenderingPadsEachColumnToItsWidestEntry) {
-    CContentTable table;
-    table.LoadFromText("Name,Status\r\nlongfilename.dll,OK\r\na,Downloaded\r\n");
-    EXPECT_EQ("\n"
-              "Name(KEY)        Status     \n"
-              "longfilename.dll OK         \n"
-              "a                Downloaded \n",
-              table.ToText());
 }
 
 TEST(UpgradeStatusCodes, TextsAndCodesConvertExactly) {

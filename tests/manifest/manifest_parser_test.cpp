@@ -65,14 +65,11 @@ TEST_F(ManifestParser, DefaultPathIsReadFromTheSectionHeldBeforeInit) {
     EXPECT_EQ(parser.DefaultDirectory(), "C:\\First");
 }
 
-// A relative folder below the base (the content file's rows show the simple cases).
+// A relative folder below a base with a trailing separator, and a rooted one on the current
+// drive when that is not C: (the golden run settings_site shows the other forms).
 TEST_F(ManifestParser, HomeDirectoriesAreResolved) {
     auto resolve = &CManifestParser::sResolveDirectoryInformation;
-    EXPECT_EQ(resolve("E:\\App", "C:\\Base"), "E:\\App");
-    EXPECT_EQ(resolve(".\\App", "C:\\Base"), ".\\App");
-    EXPECT_EQ(resolve("App", "C:\\Base"), "App");
     EXPECT_EQ(resolve("Sub\\App", "C:\\Base\\"), "C:\\Base\\Sub\\App");
-    EXPECT_EQ(resolve("\\Program Files\\App", "C:\\Base"), "C:\\Program Files\\App");
     ASSERT_TRUE(plat::paths::ChangeDirectory("Z:\\tmp"));
     EXPECT_EQ(resolve("\\Program Files\\App", "C:\\Base"), "Z:\\Program Files\\App");
 }
@@ -83,14 +80,10 @@ TEST_F(ManifestParser, DownloadTypeSuitsEveryInterestedParty) {
     Set("Software\\Vantric\\Disk", "Capabilities", "RTPatch;ZLIB;None");
     Set("Software\\Vantric\\Lower", "Capabilities", "zlib");  // names compare exactly: an unknown name counts as LZW
     pextest::SetRegValue(reg::kLocalMachine, "Software\\Vantric\\Binary", "Capabilities", reg::kRegBinary, "ZLIB");
-    trace.Clear();
     EXPECT_EQ(parser.DetermineDownloadtype("Fetch;Disk"), 2u);
-    EXPECT_TRUE(trace.Contains("CManifestParser: Interested party 'Fetch' report capabilities as 'ZLIB;LZW'"));
-    EXPECT_TRUE(trace.Contains("CManifestParser: DetermineDownloadtype returning 2"));
     for (const char* parties : {" \t\n", "Nobody", "Lower"}) {
         EXPECT_EQ(parser.DetermineDownloadtype(parties), 1u) << parties;
     }
-    EXPECT_TRUE(trace.Contains("CManifestParser: RegOpenKeyEx failed with 2"));
     EXPECT_EQ(CManifestParser::sGetInterestedPartiesInformation("Binary"), "");
 
     // The pick walks down from the last one and always ends: at None when nothing at or below
@@ -102,52 +95,20 @@ TEST_F(ManifestParser, DownloadTypeSuitsEveryInterestedParty) {
     EXPECT_EQ(CManifestParser::ConvertCompressionType("RTPatch"), 3u);
 }
 
-// Transient statuses become final, home folders are resolved, rows' scripts run; the mode's
-// text is compared exactly.
-TEST_F(ManifestParser, LoadPreparesRowsAndReadsTheMode) {
-    Publish("MandatoryOnly",
-            "FileName,UpgradeStatus,HomeDir,Force Download,DynamicFieldInfo\n"
-            "a.dll,Skipped,Sub\\App,0,FORCED = TRUE\n"
-            "b.dll,MissingDependancySkipped,,0,\n");
+// The mode's text is compared exactly; past the last row every field is empty.
+TEST_F(ManifestParser, LoadReadsTheModeAndTheTarget) {
+    Publish("MandatoryOnly", "FileName,UpgradeStatus\na.dll,Downloaded\n");
     ASSERT_TRUE(Load(parser));
     EXPECT_TRUE(parser.MandatoryOnly());
     EXPECT_EQ(parser.ContentFileTarget(), "zendor32.exe");
     ASSERT_TRUE(parser.MoveToRow(0));
-    EXPECT_EQ(parser.GetField("upgradestatus"), "AppliedSuccessfully");
-    EXPECT_EQ(parser.GetField("HomeDir"), "C:\\Base\\Sub\\App");
-    EXPECT_EQ(parser.GetField("Force Download"), "1");  // set by the row's script
-    ASSERT_TRUE(parser.NextRow());
-    EXPECT_EQ(parser.GetField("UpgradeStatus"), "ApplicationFailed");
-    EXPECT_EQ(parser.GetField("HomeDir"), "C:\\Base");
     EXPECT_FALSE(parser.NextRow());
     EXPECT_EQ(parser.GetField("FileName"), "");
-    EXPECT_TRUE(trace.Contains("CManifestParser: LoadManifest load from file success"));
 
     Set(kSection, "ContentFileMode", "mandatoryonly");
     CManifestParser lowerCase;
     ASSERT_TRUE(Load(lowerCase));
     EXPECT_FALSE(lowerCase.MandatoryOnly());
-}
-
-TEST_F(ManifestParser, RowScriptsRunUnescapedAndFailuresDoNotStopTheLoad) {
-    Publish("",
-            "FileName,UpgradeStatus,Force Download,DynamicFieldInfo\n"
-            "a.dll,,0,FORCED = AND(TRUE&#x2C; TRUE)\n"
-            "b.dll,,0,FORCED = AND(TRUE&#x2c; FALSE)\n"
-            "c.dll,,0,\n"
-            "d.dll,,1,FORCED = NoSuchColumn\n"
-            "e.dll,,0,FORCED = (\n");
-    ASSERT_TRUE(Load(parser));
-    const std::vector<std::string> forced = {"1", "0", "0", "1", "0"};
-    for (std::int32_t row = 0; row < 5; ++row) {
-        ASSERT_TRUE(parser.MoveToRow(row));
-        EXPECT_EQ(parser.GetField("Force Download"), forced[row]) << row;
-    }
-    EXPECT_TRUE(trace.Contains("Evaluating Dynamic Fields for file a.dll: [FORCED = AND(TRUE, TRUE)]"));
-    EXPECT_TRUE(trace.Contains("Evaluating Dynamic Fields for file b.dll: [FORCED = AND(TRUE, FALSE)]"));
-    EXPECT_FALSE(trace.Contains("Evaluating Dynamic Fields for file c.dll: []"));
-    EXPECT_TRUE(trace.Contains("Evaluation Plan Not Valid.  Validation Results:"));
-    EXPECT_TRUE(trace.Contains("Error Creating Plan"));
 }
 
 // A parser driven for a second product keeps nothing of the first one's content file, also

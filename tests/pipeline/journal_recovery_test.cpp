@@ -6,7 +6,6 @@
 
 #include "manifest/manifest_parser.h"
 #include "model/run_journal.h"
-#include "platform/cfile.h"
 #include "platform/files.h"
 #include "tests/pipeline/pipeline_fixture.h"
 
@@ -42,21 +41,6 @@ TEST_F(JournalRecovery, FilesThatLookLikeLeftoversAreNeverTouched) {
     EXPECT_EQ(Read("C:\\App\\a.dll"), "installed a");
     EXPECT_EQ(Read("C:\\App\\b.dll.$bak$"), "old b, kept");
     EXPECT_EQ(Read("C:\\App\\c.dll"), "new c");
-}
-
-// A target already at the new version, beside an older backup that this run did not make: the
-// rollback of its group gives back what the target held, not the older file.
-TEST_F(JournalRecovery, ARollbackNeverInstallsABackupItDidNotTake) {
-    machine.WriteFile("C:\\App\\a.dll", "new a");
-    machine.WriteFile("C:\\App\\a.dll.$bak$", "older a");
-    ContentRow failing = Row("b.dll", "new b", "G");
-    failing["Command"] = "[RUN]nosuchprogram.exe";
-    Publish({Row("a.dll", "new a", "G"), failing});
-    EXPECT_EQ(Run(), 1);
-    EXPECT_EQ(Read("C:\\App\\a.dll"), "new a");
-    EXPECT_EQ(Read("C:\\App\\a.dll.$bak$"), "older a");
-    EXPECT_FALSE(Exists("C:\\App\\a.dll.$bak$x"));
-    EXPECT_FALSE(Exists(CRunJournal::NameFor(kContent))) << "nothing is left to recover";
 }
 
 // An interrupted run's journal: a row it had replaced and not committed gets its previous
@@ -95,28 +79,6 @@ TEST_F(JournalRecovery, AnInterruptedRunIsFinishedOrUndoneAsItsJournalSays) {
     EXPECT_EQ(Read("C:\\App\\c.dll.$bak$"), "settled");
     EXPECT_EQ(Read("C:\\App\\d.dll"), "d, its own download");
     EXPECT_EQ(Read("C:\\App\\e.dll.$bak$"), "not named");
-    EXPECT_FALSE(Exists(CRunJournal::NameFor(kContent)));
-}
-
-// A row whose recovery fails (its target is held) waits: it is not applied over the backup that
-// holds its previous version, it counts as a failure, and the next run finishes the recovery.
-TEST_F(JournalRecovery, ARowWhoseRecoveryFailsWaitsForTheNextRun) {
-    machine.WriteFile("C:\\App\\a.dll", "new a");
-    machine.WriteFile("C:\\App\\a.dll.$bak$", "old a");
-    Publish({Row("a.dll", "new a"), Row("b.dll", "new b")});
-    WriteJournal("R|0|C:\\Pex\\cache\\a.dll.new|C:\\App\\a.dll|C:\\App\\a.dll.$bak$\n");
-    {
-        plat::CFile holder;
-        ASSERT_TRUE(holder.Open("C:\\App\\a.dll", plat::CFile::modeRead | plat::CFile::shareDenyWrite));
-        EXPECT_EQ(Run(), 1);
-    }
-    EXPECT_EQ(Read("C:\\App\\a.dll.$bak$"), "old a");
-    EXPECT_EQ(Read("C:\\App\\b.dll"), "new b");
-    EXPECT_EQ(Cell(0, "UpgradeStatus"), "Downloaded");
-    EXPECT_TRUE(Exists(CRunJournal::NameFor(kContent)));
-    EXPECT_EQ(Run(), 0);
-    EXPECT_EQ(Read("C:\\App\\a.dll"), "new a");
-    EXPECT_FALSE(Exists("C:\\App\\a.dll.$bak$"));
     EXPECT_FALSE(Exists(CRunJournal::NameFor(kContent)));
 }
 

@@ -32,11 +32,9 @@ const char kKey[] = "'HKLM\\Software\\Vantric\\Pex\\Zendor32'";
 
 TEST_F(RegCommandTest, AddThenQueryShowsEachTypeAsWindowsDoes) {
     const std::string key = kKey;
-    EXPECT_EQ(0, Reg("add " + key + " /v DefaultPath /d 'C:\\Program Files\\Vantric'").exit);
-    EXPECT_EQ(0, Reg("add " + key + " /v Mode /t REG_DWORD /d 31").exit);
-    EXPECT_EQ(0, Reg("add " + key + " /v List /t reg_multi_sz /d 'a\\0b'").exit);
-    EXPECT_EQ(0, Reg("add " + key + " /ve /t REG_BINARY /d 0aFF /f").exit);
-    EXPECT_EQ(0, Reg("add " + key + "'\\Sub'").exit);
+    for (const char* add : {" /v DefaultPath /d 'C:\\Program Files\\Vantric'", " /v Mode /t REG_DWORD /d 31",
+                            " /v List /t reg_multi_sz /d 'a\\0b'", " /ve /t REG_BINARY /d 0aFF /f", "'\\Sub'"})
+        EXPECT_EQ(0, Reg("add " + key + add).exit) << add;
     Outcome q = Reg("query hkey_local_machine\\\\Software\\\\Vantric\\\\Pex\\\\Zendor32");
     EXPECT_EQ(0, q.exit) << q.out;
     EXPECT_EQ("\nHKEY_LOCAL_MACHINE\\Software\\Vantric\\Pex\\Zendor32\n"
