@@ -3,8 +3,6 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
-#include "diag/trace_log.h"
-#include "entry/update_all.h"
 #include "platform/fault.h"
 
 namespace pextest {
@@ -20,16 +18,6 @@ namespace {
 }
 
 }  // namespace
-
-ChildRun RunUpdateInChild(int crashAt, const Interruption& how) {
-    return RunInChild([&] {
-        plat::fault::Clear();
-        if (crashAt > 0 && how.powerCut) plat::fault::PowerCutAtMutation(crashAt, how.keepSeed);
-        else if (crashAt > 0) plat::fault::CrashAtMutation(crashAt);
-        g_TraceLog.enabled = false;
-        UpdateAll(nullptr);
-    });
-}
 
 ChildRun RunInChild(const std::function<void()>& work) {
     ChildRun run;

@@ -36,6 +36,9 @@ protected:
     static constexpr const char* kInstalled = "C:\\App\\keep.dll";
     static constexpr const char* kForeignBackup = "C:\\App\\app.exe.$bak$";
 
+    // Enough failing scenarios of a sweep to see the pattern without drowning the output.
+    static constexpr int kFailingScenariosShown = 5;
+
     void SetUp() override;
 
     // The state that a run ended at any point must leave. A row's status agrees with the disk
@@ -69,6 +72,9 @@ protected:
     static std::vector<std::string> Names(const std::string& pattern);
     // "old", "new", "published", "(missing)" or "other (N bytes)": what the bytes are to the file.
     static std::string Which(const ProductFile& file, const std::string& bytes);
+
+    // The failed checks of the current test so far.
+    static int Failures() { return ::testing::UnitTest::GetInstance()->current_test_info()->result()->total_part_count(); }
 
     std::vector<ProductFile> files_;
 

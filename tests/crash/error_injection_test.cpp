@@ -26,7 +26,6 @@ namespace {
 namespace fault = plat::fault;
 
 constexpr std::uint32_t kCodes[] = {plat::kErrorDiskFull, plat::kErrorAccessDenied, plat::kErrorSharingViolation};
-constexpr int kFailingScenariosShown = 5;
 
 // How a faulted run ended.
 struct Outcome {
@@ -104,10 +103,6 @@ protected:
         EXPECT_EQ(clean.failures, 0);
         ExpectComplete(left);
         return Failures() == failuresBefore;
-    }
-
-    static int Failures() {
-        return ::testing::UnitTest::GetInstance()->current_test_info()->result()->total_part_count();
     }
 
     // The run's last line gives its failure count, or says that the run stopped and why; a
