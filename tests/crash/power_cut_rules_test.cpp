@@ -19,12 +19,15 @@
 #include "platform/power_cut.h"
 #include "platform/setup_install.h"
 #include "tests/crash/child_run.h"
-#include "tests/support/case_file.h"
+#include "tests/support/machine_files.h"
 #include "tests/support/test_machine.h"
 
 namespace {
 
 namespace files = plat::files;
+
+// The files of each scenario before and after its cut.
+constexpr char kCases[] = "crash/cases/power_cut_rules.txt";
 
 class PowerCutRules : public ::testing::Test {
 protected:
@@ -51,25 +54,11 @@ protected:
 
     std::string Host(const std::string& winPath) const { return plat::paths::ToHost(winPath); }
 
-    // The files of a scenario of cases/power_cut_rules.txt, before or after the cut.
-    void Before(const std::string& scenario) {
-        for (const pextest::Case& c : pextest::ReadCases("crash/cases/power_cut_rules.txt"))
-            if (c[0] == scenario && c[1] == "before") machine.WriteFile(c[2], c[3]);
-    }
-    void ExpectAfter(const std::string& scenario) {
-        for (const pextest::Case& c : pextest::ReadCases("crash/cases/power_cut_rules.txt")) {
-            if (c[0] != scenario || c[1] != "after") continue;
-            SCOPED_TRACE(c.where);
-            if (c[3] == "(missing)") EXPECT_FALSE(files::Exists(c[2]));
-            else EXPECT_EQ(files::Exists(c[2]) ? machine.ReadFile(c[2]) : "(missing)", c[3] == "(empty)" ? "" : c[3]);
-        }
-    }
-
     pextest::TestMachine machine;
 };
 
 TEST_F(PowerCutRules, BytesSurviveTheirFlushAndNamesTheirFolderFlush) {
-    Before("flushes");
+    pextest::PlaceFiles(machine, kCases, "flushes");
     ASSERT_TRUE(CutAfter([&] {
         Write("C:\\d\\unflushed.txt", "new", plat::CFile::modeNoTruncate, false);
         Write("C:\\d\\flushed.txt", "new", plat::CFile::modeNoTruncate, true);
@@ -83,11 +72,11 @@ TEST_F(PowerCutRules, BytesSurviveTheirFlushAndNamesTheirFolderFlush) {
         plat::power::FolderFlushed(Host("C:\\f"));  // not the other folder
         close(empty);
     }));
-    ExpectAfter("flushes");
+    pextest::ExpectFiles(machine, kCases, "flushes");
 }
 
 TEST_F(PowerCutRules, WhatThePlatformReportsDoneSurvivesACut) {
-    Before("reported");
+    pextest::PlaceFiles(machine, kCases, "reported");
     ASSERT_TRUE(CutAfter([] {
         // First, so that its folder flush (which it always made) covers none of the others.
         files::CopyToKeep("C:\\d\\source.txt", "C:\\d\\kept.txt");
@@ -102,11 +91,11 @@ TEST_F(PowerCutRules, WhatThePlatformReportsDoneSurvivesACut) {
         files::Copy("C:\\d\\source.txt", "C:\\d\\sub\\copy.txt", false);
         Write("C:\\d\\created.txt", "created", plat::CFile::modeCreate, true);
     }));
-    ExpectAfter("reported");
+    pextest::ExpectFiles(machine, kCases, "reported");
 }
 
 TEST_F(PowerCutRules, ABatchMakesItsCopiesAndDeletionsDurableWhenItEnds) {
-    Before("batch");
+    pextest::PlaceFiles(machine, kCases, "batch");
     ASSERT_TRUE(CutAfter([] {
         {
             files::FolderFlushBatch ended;
@@ -118,11 +107,11 @@ TEST_F(PowerCutRules, ABatchMakesItsCopiesAndDeletionsDurableWhenItEnds) {
         files::Copy("C:\\d\\source.txt", "C:\\f\\pending.txt", false);
         files::Remove("C:\\f\\gone.txt");
     }));
-    ExpectAfter("batch");
+    pextest::ExpectFiles(machine, kCases, "batch");
 }
 
 TEST_F(PowerCutRules, AFileStagedForTheRestartSurvivesWithTheQueue) {
-    Before("restart");
+    pextest::PlaceFiles(machine, kCases, "restart");
     ASSERT_TRUE(CutAfter([] {
         plat::CFile holder;  // the target in use
         holder.Open("C:\\d\\busy.dll", plat::CFile::modeRead | plat::CFile::shareExclusive);
