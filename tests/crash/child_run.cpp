@@ -7,18 +7,6 @@
 
 namespace pextest {
 
-namespace {
-
-[[noreturn]] void RunAndLeave(const std::function<void()>& work, int reportFd) {
-    work();
-    const int mutations = plat::fault::MutationCount();
-    const bool reported = write(reportFd, &mutations, sizeof mutations) == sizeof mutations;
-    // No destructors: the parent's test objects (the machine root among them) are not ours.
-    _exit(reported ? 0 : 1);
-}
-
-}  // namespace
-
 ChildRun RunInChild(const std::function<void()>& work) {
     ChildRun run;
     int fds[2];
@@ -29,7 +17,10 @@ ChildRun RunInChild(const std::function<void()>& work) {
     const pid_t child = fork();
     if (child == 0) {
         close(fds[0]);
-        RunAndLeave(work, fds[1]);
+        work();
+        const int mutations = plat::fault::MutationCount();
+        const bool reported = write(fds[1], &mutations, sizeof mutations) == sizeof mutations;
+        _exit(reported ? 0 : 1);  // no destructors: the parent's test objects are not ours
     }
     close(fds[1]);
     int mutations = 0;

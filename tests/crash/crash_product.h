@@ -1,13 +1,5 @@
-// The product of the crash and error-injection tests, and the states it may be found in.
-//
-// Three groups, published on the fixture's machine:
-//   Core  core.dll    replaces a file (backup), [REGISTRY] command
-//         packed.exe  SZDD download expanded through Rivzip.dll, replaces a read-only file
-//   App   app.exe     replaces a file, dated, [TRY-RUN] of pextestprog; depends on Core and
-//                     sorts before it, so the first pass defers it
-//         readme.txt  a new file: nothing to back up, a rollback deletes it
-//   Data  data.cfg    zlib download, replaces a file
-// Beside them, files that only look like leftovers of an earlier run, which no run may touch: a
+// The product of the crash and error-injection tests (its update files are in
+// cases/product.txt), and the states it may be found in. Beside them, files that only look like leftovers of an earlier run, which no run may touch: a
 // row read as applied ("Skipped") whose download is an installed file, keep.dll, and a backup
 // of app.exe that some other tool left.
 #pragma once

@@ -40,7 +40,6 @@ public:
     void Clear();
 
     const std::string& Path() const { return path_; }
-    TraceLog& Log() const { return log_; }
 
 private:
     std::string path_;
@@ -50,8 +49,5 @@ private:
 // The lines of trace-file bytes, split at line feeds, with a carriage return before each
 // line feed and a leading time stamp removed; nothing after the last line end is a line.
 std::vector<std::string> TraceLines(const std::string& bytes);
-
-// The line without a leading "yyyy/mm/dd - hh:mm:ss.mmm - " stamp; unchanged when it has none.
-std::string StripTraceStamp(const std::string& line);
 
 }  // namespace pextest
