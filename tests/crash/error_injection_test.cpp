@@ -31,7 +31,6 @@ constexpr std::uint32_t kCodes[] = {plat::kErrorDiskFull, plat::kErrorAccessDeni
 struct Outcome {
     std::int32_t failures = 0;
     bool stopped = false;  // the content file could not be saved: the run stopped there
-    std::uint32_t stopCode = 0;
     int operations = 0;  // of the kind of the fault rule, checked by the platform
 };
 
@@ -51,9 +50,8 @@ protected:
         try {
             CManifestParser parser;
             outcome.failures = parser.ProcessUpdateInformation(_bstr_t(kProduct), nullptr);
-        } catch (const plat::CFileException& e) {
+        } catch (const plat::CFileException&) {
             outcome.stopped = true;
-            outcome.stopCode = e.OsError();
         }
         outcome.operations = fault::OperationCount(op);
         fault::Clear();

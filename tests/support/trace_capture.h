@@ -1,10 +1,6 @@
 // Captures the trace log for one test: points g_TraceLog (or another log) at a fresh file on
 // the current test machine and reads back the lines written, without their time stamps and
-// line ends. Construct it after the pextest::TestMachine, e.g.
-//   pextest::TestMachine m;
-//   pextest::TraceCapture trace;
-//   ... code under test ...
-//   EXPECT_EQ(trace.Lines(), (std::vector<std::string>{"CFile_: Apply", ...}));
+// line ends. Construct it after the pextest::TestMachine.
 #pragma once
 #include <string>
 #include <vector>
