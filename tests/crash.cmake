@@ -9,19 +9,11 @@ if(NOT WIN32)
       ${CMAKE_CURRENT_SOURCE_DIR}/pipeline/pipeline_fixture.cpp
       ${CMAKE_CURRENT_SOURCE_DIR}/rivzip/memory_streams.cpp)
 
-  set(PEX_SWEEP_SUPPORT
-      ${CMAKE_CURRENT_SOURCE_DIR}/crash/child_run.cpp
-      ${CMAKE_CURRENT_SOURCE_DIR}/crash/crash_sweep.cpp
-      ${PEX_CRASH_SUPPORT})
-  pex_add_test(crash_points_test
-    SOURCES ${CMAKE_CURRENT_SOURCE_DIR}/crash/crash_points_test.cpp ${PEX_SWEEP_SUPPORT}
+  pex_add_test(crash_sweep_test
+    SOURCES ${CMAKE_CURRENT_SOURCE_DIR}/crash/crash_sweep_test.cpp
+            ${CMAKE_CURRENT_SOURCE_DIR}/crash/child_run.cpp ${PEX_CRASH_SUPPORT}
     LIBS mendler_core rivzip_codec ZLIB::ZLIB)
-  add_dependencies(crash_points_test Rivzip pextestprog)
-
-  pex_add_test(power_cut_test
-    SOURCES ${CMAKE_CURRENT_SOURCE_DIR}/crash/power_cut_test.cpp ${PEX_SWEEP_SUPPORT}
-    LIBS mendler_core rivzip_codec ZLIB::ZLIB)
-  add_dependencies(power_cut_test Rivzip pextestprog)
+  add_dependencies(crash_sweep_test Rivzip pextestprog)
 
   pex_add_test(power_cut_rules_test
     SOURCES ${CMAKE_CURRENT_SOURCE_DIR}/crash/power_cut_rules_test.cpp

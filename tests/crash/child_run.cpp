@@ -3,33 +3,9 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
-#include "diag/trace_log.h"
-#include "entry/update_all.h"
 #include "platform/fault.h"
 
 namespace pextest {
-
-namespace {
-
-[[noreturn]] void RunAndLeave(const std::function<void()>& work, int reportFd) {
-    work();
-    const int mutations = plat::fault::MutationCount();
-    const bool reported = write(reportFd, &mutations, sizeof mutations) == sizeof mutations;
-    // No destructors: the parent's test objects (the machine root among them) are not ours.
-    _exit(reported ? 0 : 1);
-}
-
-}  // namespace
-
-ChildRun RunUpdateInChild(int crashAt, const Interruption& how) {
-    return RunInChild([&] {
-        plat::fault::Clear();
-        if (crashAt > 0 && how.powerCut) plat::fault::PowerCutAtMutation(crashAt, how.keepSeed);
-        else if (crashAt > 0) plat::fault::CrashAtMutation(crashAt);
-        g_TraceLog.enabled = false;
-        UpdateAll(nullptr);
-    });
-}
 
 ChildRun RunInChild(const std::function<void()>& work) {
     ChildRun run;
@@ -41,7 +17,10 @@ ChildRun RunInChild(const std::function<void()>& work) {
     const pid_t child = fork();
     if (child == 0) {
         close(fds[0]);
-        RunAndLeave(work, fds[1]);
+        work();
+        const int mutations = plat::fault::MutationCount();
+        const bool reported = write(fds[1], &mutations, sizeof mutations) == sizeof mutations;
+        _exit(reported ? 0 : 1);  // no destructors: the parent's test objects are not ours
     }
     close(fds[1]);
     int mutations = 0;

@@ -8,6 +8,7 @@
 #include "model/run_journal.h"
 #include "platform/files.h"
 #include "tests/rivzip/memory_streams.h"
+#include "tests/support/case_file.h"
 #include "tests/support/test_registry.h"
 
 namespace reg = plat::reg;
@@ -16,7 +17,7 @@ namespace pextest {
 
 namespace {
 
-// About 150 KB of text: the expansions write it in several pieces, each a crash point.
+// About 150 KB of text.
 std::string Payload(const std::string& name) {
     std::string bytes;
     for (int line = 0; bytes.size() < 150000; ++line)
@@ -33,42 +34,28 @@ std::string Deflate(const std::string& bytes) {
     return out;
 }
 
-std::string Szdd(const std::string& bytes) {
-    const auto packed = rivziptest::Compress(rivziptest::Bytes(bytes.begin(), bytes.end()));
-    return std::string(packed.begin(), packed.end());
-}
-
 }  // namespace
 
 void CrashProduct::SetUp() {
     SetRegText(reg::kLocalMachine, "Software\\Vantric\\Fetch", "Capabilities", "ZLIB;LZW");
     SetRegText(reg::kLocalMachine, "Software\\Vantric\\Disk", "Capabilities", "LZW;None");
-    files_ = {
-        {"core.dll", true, "core 1.0", "core 2.0", "", "", false},
-        {"packed.exe", true, "packed 1.0", Payload("packed"), "", "", true},
-        {"app.exe", true, "app 1.0", "app 2.0", "", "", false},
-        {"readme.txt", false, "", "read me, 2.0", "", "", false},
-        {"data.cfg", true, "data 1.0", Payload("data"), "", "", true},
-    };
-    files_[1].published = Szdd(files_[1].newBytes);
-    files_[4].published = Deflate(files_[4].newBytes);
     std::vector<ContentRow> rows;
-    const char* groups[] = {"Core", "Core", "App", "App", "Data"};
-    for (std::size_t i = 0; i < files_.size(); ++i) {
-        ProductFile& file = files_[i];
-        if (file.published.empty()) file.published = file.newBytes;
+    for (const Case& c : ReadCases("crash/cases/product.txt")) {
+        auto cell = [&](std::size_t i) { return c[i] == "-" ? std::string() : c[i]; };
+        ProductFile file{c[0], c[1] != "-", cell(1), c[2], "", "", c[3] != "plain"};
+        if (c[2] == "(payload)") file.newBytes = Payload(c[0].substr(0, c[0].find('.')));
+        if (c[3] == "szdd") file.published = rivziptest::CompressText(file.newBytes);
+        else file.published = c[3] == "zlib" ? Deflate(file.newBytes) : file.newBytes;
         if (file.hadTarget) machine.WriteFile(file.Target(), file.oldBytes);
-        ContentRow row = Row(file.name, file.published, groups[i], i == 2 ? "Core" : "");
+        ContentRow row = Row(file.name, file.published, cell(4), cell(5));
         file.download = row["DownLoadCacheFile"];
-        if (file.expanded) {
-            row["NeedsDecompression"] = "1";
-            row["InterestedParties"] = file.name == "packed.exe" ? "Fetch;Disk" : "Fetch";
-        }
+        row["NeedsDecompression"] = file.expanded ? "1" : "0";
+        if (file.expanded) row["InterestedParties"] = cell(6);
+        row["Command"] = cell(7);
+        row["UpdateDate"] = cell(8);
+        files_.push_back(file);
         rows.push_back(row);
     }
-    rows[0]["Command"] = std::string("[REGISTRY](STRING)HKLM\\") + kRegistryMark + "\\Core=2.0";
-    rows[2]["Command"] = "[TRY-RUN]pextestprog mark ran.txt";
-    rows[2]["UpdateDate"] = "2003-12-31 22:30:00";
     ASSERT_TRUE(plat::files::SetAttributes(files_[1].Target(), plat::files::kAttrReadOnly));
     machine.WriteFile(kInstalled, "keep 1.0");
     machine.WriteFile(kForeignBackup, "app 0.9, another tool's");

@@ -1,13 +1,5 @@
-// The product of the crash and error-injection tests, and the states it may be found in.
-//
-// Three groups, published on the fixture's machine:
-//   Core  core.dll    replaces a file (backup), [REGISTRY] command
-//         packed.exe  SZDD download expanded through Rivzip.dll, replaces a read-only file
-//   App   app.exe     replaces a file, dated, [TRY-RUN] of pextestprog; depends on Core and
-//                     sorts before it, so the first pass defers it
-//         readme.txt  a new file: nothing to back up, a rollback deletes it
-//   Data  data.cfg    zlib download, replaces a file
-// Beside them, files that only look like leftovers of an earlier run, which no run may touch: a
+// The product of the crash and error-injection tests (its update files are in
+// cases/product.txt), and the states it may be found in. Beside them, files that only look like leftovers of an earlier run, which no run may touch: a
 // row read as applied ("Skipped") whose download is an installed file, keep.dll, and a backup
 // of app.exe that some other tool left.
 #pragma once
@@ -35,6 +27,9 @@ protected:
     static constexpr const char* kRunMark = "C:\\App\\ran.txt";
     static constexpr const char* kInstalled = "C:\\App\\keep.dll";
     static constexpr const char* kForeignBackup = "C:\\App\\app.exe.$bak$";
+
+    // Enough failing scenarios of a sweep to see the pattern without drowning the output.
+    static constexpr int kFailingScenariosShown = 5;
 
     void SetUp() override;
 
@@ -69,6 +64,9 @@ protected:
     static std::vector<std::string> Names(const std::string& pattern);
     // "old", "new", "published", "(missing)" or "other (N bytes)": what the bytes are to the file.
     static std::string Which(const ProductFile& file, const std::string& bytes);
+
+    // The failed checks of the current test so far.
+    static int Failures() { return ::testing::UnitTest::GetInstance()->current_test_info()->result()->total_part_count(); }
 
     std::vector<ProductFile> files_;
 

@@ -26,13 +26,11 @@ namespace {
 namespace fault = plat::fault;
 
 constexpr std::uint32_t kCodes[] = {plat::kErrorDiskFull, plat::kErrorAccessDenied, plat::kErrorSharingViolation};
-constexpr int kFailingScenariosShown = 5;
 
 // How a faulted run ended.
 struct Outcome {
     std::int32_t failures = 0;
     bool stopped = false;  // the content file could not be saved: the run stopped there
-    std::uint32_t stopCode = 0;
     int operations = 0;  // of the kind of the fault rule, checked by the platform
 };
 
@@ -52,9 +50,8 @@ protected:
         try {
             CManifestParser parser;
             outcome.failures = parser.ProcessUpdateInformation(_bstr_t(kProduct), nullptr);
-        } catch (const plat::CFileException& e) {
+        } catch (const plat::CFileException&) {
             outcome.stopped = true;
-            outcome.stopCode = e.OsError();
         }
         outcome.operations = fault::OperationCount(op);
         fault::Clear();
@@ -104,10 +101,6 @@ protected:
         EXPECT_EQ(clean.failures, 0);
         ExpectComplete(left);
         return Failures() == failuresBefore;
-    }
-
-    static int Failures() {
-        return ::testing::UnitTest::GetInstance()->current_test_info()->result()->total_part_count();
     }
 
     // The run's last line gives its failure count, or says that the run stopped and why; a

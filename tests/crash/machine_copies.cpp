@@ -40,19 +40,18 @@ std::string HiveText(const char* hive) {
 
 }  // namespace
 
-std::string CopyMachine(const std::string& fromRoot) {
+MachineCopy::MachineCopy(const std::string& fromRoot) {
     // Closes the registry database, so that everything written is in its main file.
     plat::machine::SetRoot(plat::machine::Root());
-    std::string root = CopiesFolder() + "/pexcrash-XXXXXX";
-    if (!mkdtemp(root.data())) throw std::runtime_error("cannot create a machine copy");
-    fs::copy(fromRoot, root, fs::copy_options::recursive | fs::copy_options::copy_symlinks);
-    plat::machine::SetRoot(root);
-    return root;
+    root_ = CopiesFolder() + "/pexcrash-XXXXXX";
+    if (!mkdtemp(root_.data())) throw std::runtime_error("cannot create a machine copy");
+    fs::copy(fromRoot, root_, fs::copy_options::recursive | fs::copy_options::copy_symlinks);
+    plat::machine::SetRoot(root_);
 }
 
-void RemoveMachine(const std::string& root) {
+MachineCopy::~MachineCopy() {
     std::error_code ec;
-    fs::remove_all(root, ec);
+    fs::remove_all(root_, ec);
 }
 
 MachineSnapshot SnapshotMachine() {

@@ -6,20 +6,15 @@
 
 namespace pextest {
 
-// Copies the machine root at fromRoot into a new root and points the platform at the copy.
-// The copies live in memory (/dev/shm) when the host has it: the runs flush every file and
-// registry change to the disk, which memory does at no cost. The registry of the current root
-// is closed first, so that its file is complete when it is copied.
-std::string CopyMachine(const std::string& fromRoot);
-
-// Removes a root made by CopyMachine.
-void RemoveMachine(const std::string& root);
-
-// A copy that is removed when it goes out of scope, whichever way the test leaves.
+// A copy of the machine root at fromRoot, the platform pointed at it; removed when it goes out
+// of scope, whichever way the test leaves. The copies live in memory (/dev/shm) when the host
+// has it: the runs flush every file and registry change to the disk, which memory does at no
+// cost. The registry of the current root is closed first, so that its file is complete when it
+// is copied.
 class MachineCopy {
 public:
-    explicit MachineCopy(const std::string& fromRoot) : root_(CopyMachine(fromRoot)) {}
-    ~MachineCopy() { RemoveMachine(root_); }
+    explicit MachineCopy(const std::string& fromRoot);
+    ~MachineCopy();
     MachineCopy(const MachineCopy&) = delete;
     MachineCopy& operator=(const MachineCopy&) = delete;
     const std::string& Root() const { return root_; }

@@ -1,6 +1,7 @@
 // The power-cut model and the platform's flushes, one operation at a time: a forked child makes
 // some changes and the power is cut after them; the machine must then hold exactly what was
-// made durable. The whole-run sweep is power_cut_test.cpp.
+// made durable (the files before and after each cut are in cases/power_cut_rules.txt). The
+// whole-run sweep is crash_sweep_test.cpp.
 #include <gtest/gtest.h>
 
 #include <fcntl.h>
@@ -18,11 +19,15 @@
 #include "platform/power_cut.h"
 #include "platform/setup_install.h"
 #include "tests/crash/child_run.h"
+#include "tests/support/machine_files.h"
 #include "tests/support/test_machine.h"
 
 namespace {
 
 namespace files = plat::files;
+
+// The files of each scenario before and after its cut.
+constexpr char kCases[] = "crash/cases/power_cut_rules.txt";
 
 class PowerCutRules : public ::testing::Test {
 protected:
@@ -53,10 +58,7 @@ protected:
 };
 
 TEST_F(PowerCutRules, BytesSurviveTheirFlushAndNamesTheirFolderFlush) {
-    machine.WriteFile("C:\\d\\unflushed.txt", "old");
-    machine.WriteFile("C:\\d\\flushed.txt", "old");
-    machine.WriteFile("C:\\d\\renamed.txt", "old");
-    machine.WriteFile("C:\\f\\other.txt", "other");
+    pextest::PlaceFiles(machine, kCases, "flushes");
     ASSERT_TRUE(CutAfter([&] {
         Write("C:\\d\\unflushed.txt", "new", plat::CFile::modeNoTruncate, false);
         Write("C:\\d\\flushed.txt", "new", plat::CFile::modeNoTruncate, true);
@@ -70,22 +72,11 @@ TEST_F(PowerCutRules, BytesSurviveTheirFlushAndNamesTheirFolderFlush) {
         plat::power::FolderFlushed(Host("C:\\f"));  // not the other folder
         close(empty);
     }));
-    EXPECT_EQ(machine.ReadFile("C:\\d\\unflushed.txt"), "old");
-    EXPECT_EQ(machine.ReadFile("C:\\d\\flushed.txt"), "new");
-    EXPECT_EQ(machine.ReadFile("C:\\d\\renamed.txt"), "old");
-    EXPECT_FALSE(files::Exists("C:\\d\\moved.txt"));
-    EXPECT_FALSE(files::Exists("C:\\d\\lost.txt"));
-    EXPECT_TRUE(files::Exists("C:\\f\\empty.txt"));
-    EXPECT_EQ(machine.ReadFile("C:\\f\\empty.txt"), "");
+    pextest::ExpectFiles(machine, kCases, "flushes");
 }
 
-// What the platform reports done survives: the copy, the durable write, the rename, the
-// deletion, the second name, the new folder and the file created and flushed through CFile.
 TEST_F(PowerCutRules, WhatThePlatformReportsDoneSurvivesACut) {
-    machine.WriteFile("C:\\d\\source.txt", "source");
-    machine.WriteFile("C:\\d\\rewritten.txt", "old");
-    machine.WriteFile("C:\\d\\gone.txt", "old");
-    machine.WriteFile("C:\\e\\moving.txt", "moving");
+    pextest::PlaceFiles(machine, kCases, "reported");
     ASSERT_TRUE(CutAfter([] {
         // First, so that its folder flush (which it always made) covers none of the others.
         files::CopyToKeep("C:\\d\\source.txt", "C:\\d\\kept.txt");
@@ -100,25 +91,11 @@ TEST_F(PowerCutRules, WhatThePlatformReportsDoneSurvivesACut) {
         files::Copy("C:\\d\\source.txt", "C:\\d\\sub\\copy.txt", false);
         Write("C:\\d\\created.txt", "created", plat::CFile::modeCreate, true);
     }));
-    EXPECT_EQ(machine.ReadFile("C:\\d\\copy.txt"), "source");
-    EXPECT_EQ(machine.ReadFile("C:\\d\\rewritten.txt"), "newest");
-    EXPECT_EQ(machine.ReadFile("C:\\d\\written.txt"), "new");
-    EXPECT_EQ(machine.ReadFile("C:\\d\\moved.txt"), "moving");
-    EXPECT_FALSE(files::Exists("C:\\e\\moving.txt"));
-    EXPECT_FALSE(files::Exists("C:\\d\\gone.txt"));
-    EXPECT_EQ(machine.ReadFile("C:\\d\\kept.txt"), "source");
-    EXPECT_EQ(machine.ReadFile("C:\\d\\sub\\copy.txt"), "source");
-    EXPECT_EQ(machine.ReadFile("C:\\d\\created.txt"), "created");
+    pextest::ExpectFiles(machine, kCases, "reported");
 }
 
-// A folder flush batch makes its copies and deletions durable when it ends, not before; a
-// backup (CopyToKeep) never waits for it, since its name must be on the disk before its source
-// is replaced.
 TEST_F(PowerCutRules, ABatchMakesItsCopiesAndDeletionsDurableWhenItEnds) {
-    machine.WriteFile("C:\\d\\source.txt", "source");
-    machine.WriteFile("C:\\d\\gone.txt", "old");
-    machine.WriteFile("C:\\e\\target.txt", "target");
-    machine.WriteFile("C:\\f\\gone.txt", "old");
+    pextest::PlaceFiles(machine, kCases, "batch");
     ASSERT_TRUE(CutAfter([] {
         {
             files::FolderFlushBatch ended;
@@ -130,17 +107,11 @@ TEST_F(PowerCutRules, ABatchMakesItsCopiesAndDeletionsDurableWhenItEnds) {
         files::Copy("C:\\d\\source.txt", "C:\\f\\pending.txt", false);
         files::Remove("C:\\f\\gone.txt");
     }));
-    EXPECT_EQ(machine.ReadFile("C:\\d\\copy.txt"), "source");
-    EXPECT_FALSE(files::Exists("C:\\d\\gone.txt"));
-    EXPECT_EQ(machine.ReadFile("C:\\e\\kept.txt"), "target");
-    EXPECT_FALSE(files::Exists("C:\\f\\pending.txt"));
-    EXPECT_TRUE(files::Exists("C:\\f\\gone.txt"));
+    pextest::ExpectFiles(machine, kCases, "batch");
 }
 
-// A file staged for the restart is whole on the disk before the queue names it.
 TEST_F(PowerCutRules, AFileStagedForTheRestartSurvivesWithTheQueue) {
-    machine.WriteFile("C:\\d\\new.dll", "version 2");
-    machine.WriteFile("C:\\d\\busy.dll", "version 1");
+    pextest::PlaceFiles(machine, kCases, "restart");
     ASSERT_TRUE(CutAfter([] {
         plat::CFile holder;  // the target in use
         holder.Open("C:\\d\\busy.dll", plat::CFile::modeRead | plat::CFile::shareExclusive);

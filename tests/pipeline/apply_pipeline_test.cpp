@@ -20,11 +20,6 @@ bool CountSteps(CProgressData* p) {
     return true;
 }
 
-std::string Szdd(const std::string& bytes) {
-    const auto packed = rivziptest::Compress(rivziptest::Bytes(bytes.begin(), bytes.end()));
-    return std::string(packed.begin(), packed.end());
-}
-
 class ApplyPipeline : public pextest::PipelineTest {
 protected:
     std::int32_t Run(ProgressCallback callback = nullptr) {
@@ -86,7 +81,7 @@ TEST_F(ApplyPipeline, DownloadsThatResistRemovalDoNotKeepTheContentFile) {
 // The digest is of the file as installed: the download after its expansion.
 TEST_F(ApplyPipeline, ACompressedDownloadIsCheckedAsExpanded) {
     const std::string payload = "szdd payload, szdd payload";
-    ContentRow row = Row("packed.exe", Szdd(payload));
+    ContentRow row = Row("packed.exe", rivziptest::CompressText(payload));
     row["Sha256"] = "5361e6a88b42ab58ec0066a63c955151e7bb12ad9aee3c4dbecdc0039676ed6c";
     row["NeedsDecompression"] = "1";  // SZDD, the download type of a row without capabilities
     Publish({row});

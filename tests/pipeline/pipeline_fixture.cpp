@@ -73,12 +73,6 @@ CContentTable PipelineTest::Content() const {
     return table;
 }
 
-std::string PipelineTest::Cell(std::uint32_t row, const std::string& column) const {
-    const CContentTable table = Content();
-    const int index = table.ColumnIndex(column);
-    return index < 0 ? std::string() : table.Cell(row, static_cast<std::uint32_t>(index));
-}
-
 bool PipelineTest::ContentEntriesPresent() const {
     const std::string section = std::string("Software\\Vantric\\Pex\\") + kProduct;
     std::string bytes;

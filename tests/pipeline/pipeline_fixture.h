@@ -33,7 +33,6 @@ protected:
 
     // The content file as it is now on disk.
     CContentTable Content() const;
-    std::string Cell(std::uint32_t row, const std::string& column) const;
     bool ContentEntriesPresent() const;
 
     std::string Installed(const std::string& fileName) const;  // bytes at C:\App\fileName

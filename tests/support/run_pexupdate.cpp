@@ -10,22 +10,22 @@ namespace pextest {
 
 namespace {
 
-#ifdef _WIN32
-// cmd.exe runs the line: it quotes with double quotes, and it drops the first and the last
-// quote of a line that starts with one, hence the outer pair.
 std::string ShellLine(const std::string& pexupdatePath, const TestMachine& machine,
                       const std::string& args) {
-    std::string line = "'" + pexupdatePath + "' --machine '" + machine.Root() + "' " + args;
+    std::string line = "'" + pexupdatePath + "' --machine '" + machine.Root() + "' " + args + " 2>&1";
+#ifdef _WIN32
+    // cmd.exe runs the line: it quotes with double quotes, and it drops the first and the last
+    // quote of a line that starts with one, hence the outer pair.
     for (char& c : line) c = c == '\'' ? '"' : c;
-    return "\"" + line + " 2>&1\"";
+    line = "\"" + line + "\"";
+#endif
+    return line;
 }
+
+#ifdef _WIN32
 FILE* OpenPipe(const std::string& line) { return _popen(line.c_str(), "r"); }
 int ExitOf(FILE* pipe) { return _pclose(pipe); }
 #else
-std::string ShellLine(const std::string& pexupdatePath, const TestMachine& machine,
-                      const std::string& args) {
-    return "'" + pexupdatePath + "' --machine '" + machine.Root() + "' " + args + " 2>&1";
-}
 FILE* OpenPipe(const std::string& line) { return popen(line.c_str(), "r"); }
 int ExitOf(FILE* pipe) {
     const int status = pclose(pipe);

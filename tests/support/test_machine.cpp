@@ -40,15 +40,8 @@ void TestMachine::WriteFile(const std::string& winPath, const std::string& bytes
 }
 
 std::string TestMachine::ReadFile(const std::string& winPath) const {
-    std::ifstream in(plat::paths::ToHost(winPath), std::ios::binary);
-    std::ostringstream s;
-    s << in.rdbuf();
-    return s.str();
+    return ReadHostFile(plat::paths::ToHost(winPath));
 }
-
-}  // namespace pextest
-
-namespace pextest {
 
 std::string ReadHostFile(const std::string& hostPath) {
     std::ifstream in(hostPath, std::ios::binary);

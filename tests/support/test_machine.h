@@ -26,9 +26,6 @@ private:
     std::string root_;
 };
 
-}  // namespace pextest
-
-namespace pextest {
 // The bytes of a host file (fixtures); empty when missing.
 std::string ReadHostFile(const std::string& hostPath);
 }  // namespace pextest

@@ -7,11 +7,16 @@ namespace reg = plat::reg;
 
 namespace pextest {
 
+void CreateRegKey(reg::HKey root, const std::string& key, reg::Key* created) {
+    reg::Key k;
+    if (reg::CreateKey(root, key, reg::kKeyAllAccess, (created ? *created : k).out(), nullptr) != 0)
+        throw std::runtime_error("cannot create test key " + key);
+}
+
 void SetRegValue(reg::HKey root, const std::string& key, const std::string& name, std::uint32_t type,
                  const std::string& bytes) {
     reg::Key k;
-    if (reg::CreateKey(root, key, reg::kKeyAllAccess, k.out(), nullptr) != 0)
-        throw std::runtime_error("cannot create test key " + key);
+    CreateRegKey(root, key, &k);
     if (reg::SetValue(k.get(), name, type, reinterpret_cast<const std::uint8_t*>(bytes.data()),
                       static_cast<std::uint32_t>(bytes.size())) != 0)
         throw std::runtime_error("cannot set test value " + name);
@@ -20,12 +25,6 @@ void SetRegValue(reg::HKey root, const std::string& key, const std::string& name
 void SetRegText(reg::HKey root, const std::string& key, const std::string& name,
                 const std::string& text) {
     SetRegValue(root, key, name, reg::kRegSz, std::string(text.c_str(), text.size() + 1));
-}
-
-void CreateRegKey(reg::HKey root, const std::string& key) {
-    reg::Key k;
-    if (reg::CreateKey(root, key, reg::kKeyAllAccess, k.out(), nullptr) != 0)
-        throw std::runtime_error("cannot create test key " + key);
 }
 
 bool GetRegValue(reg::HKey root, const std::string& key, const std::string& name, std::string* bytes,

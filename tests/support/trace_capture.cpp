@@ -7,6 +7,16 @@
 
 namespace pextest {
 
+namespace {
+
+// The line without a leading "yyyy/mm/dd - hh:mm:ss.mmm - " stamp; unchanged when it has none.
+std::string StripTraceStamp(const std::string& line) {
+    static const std::regex stamp(R"(^\d{4}/\d{2}/\d{2} - \d{2}:\d{2}:\d{2}\.\d{3} - )");
+    return std::regex_replace(line, stamp, "", std::regex_constants::format_first_only);
+}
+
+}  // namespace
+
 TraceCapture::TraceCapture(const std::string& winPath, TraceLog& log) : path_(winPath), log_(log) {
     log_.Close();
     log_.enabled = log_.timestamps = log_.ensureNewline = true;
@@ -46,11 +56,6 @@ bool TraceCapture::Contains(const std::string& line) const {
 
 void TraceCapture::Clear() {
     log_.Delete();
-}
-
-std::string StripTraceStamp(const std::string& line) {
-    static const std::regex stamp(R"(^\d{4}/\d{2}/\d{2} - \d{2}:\d{2}:\d{2}\.\d{3} - )");
-    return std::regex_replace(line, stamp, "", std::regex_constants::format_first_only);
 }
 
 std::vector<std::string> TraceLines(const std::string& bytes) {

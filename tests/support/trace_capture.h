@@ -1,10 +1,6 @@
 // Captures the trace log for one test: points g_TraceLog (or another log) at a fresh file on
 // the current test machine and reads back the lines written, without their time stamps and
-// line ends. Construct it after the pextest::TestMachine, e.g.
-//   pextest::TestMachine m;
-//   pextest::TraceCapture trace;
-//   ... code under test ...
-//   EXPECT_EQ(trace.Lines(), (std::vector<std::string>{"CFile_: Apply", ...}));
+// line ends. Construct it after the pextest::TestMachine.
 #pragma once
 #include <string>
 #include <vector>
@@ -40,7 +36,6 @@ public:
     void Clear();
 
     const std::string& Path() const { return path_; }
-    TraceLog& Log() const { return log_; }
 
 private:
     std::string path_;
@@ -50,8 +45,5 @@ private:
 // The lines of trace-file bytes, split at line feeds, with a carriage return before each
 // line feed and a leading time stamp removed; nothing after the last line end is a line.
 std::vector<std::string> TraceLines(const std::string& bytes);
-
-// The line without a leading "yyyy/mm/dd - hh:mm:ss.mmm - " stamp; unchanged when it has none.
-std::string StripTraceStamp(const std::string& line);
 
 }  // namespace pextest
