@@ -32,6 +32,7 @@
 #include "platform/setup_install.h"
 #include "tests/runs/golden_child.h"
 #include "tests/support/platform_guard.h"
+#include "tests/support/run_pexupdate.h"
 #include "tests/support/test_machine.h"
 
 namespace fs = std::filesystem;
@@ -123,6 +124,10 @@ public:
     explicit GoldenRun(fs::path folder) : folder_(std::move(folder)) {}
 
     void TestBody() override {
+#ifdef _WIN32
+        if (Slurp(folder_ / "scenario.txt").find("\npexupdate ") != std::string::npos)
+            GTEST_SKIP() << "the host program's commands are given to a POSIX shell";
+#endif
         if (!golden::IsScenarioProcess()) {
             const std::string name = "golden." + folder_.filename().string();
             EXPECT_EQ(golden::RunScenarioAlone(name), 0) << name << " failed in its own process (its output is above)";
@@ -146,6 +151,7 @@ public:
             else if (w[0] == "lock") lock = std::make_unique<golden::LockHolder>();
             else if (w[0] == "module") PlaceModule(w.at(1), line.substr(line.find(w.at(2))));
             else if (w[0] == "run") Run(w, line);
+            else if (w[0] == "pexupdate") Pexupdate(line);
             else ADD_FAILURE() << "unknown directive: " << line;
         }
         EXPECT_EQ(OpenHandles(), handles_) << "a run left a file handle open";
@@ -160,6 +166,7 @@ public:
         Compare("files.txt", Files());
         Compare("registry.reg", Registry());
         Compare("restart.txt", RestartQueue());
+        if (!output_.empty()) Compare("output.txt", output_);
         CompareContentFiles();
     }
 
@@ -235,6 +242,14 @@ private:
         progress_ += "returned " + result + "\n";
         // The support snapshot lists registry values too.
         trace_ += "#### " + line + "\n" + SortedValues(Normalised(Slurp(plat::paths::ToHost(kLog)), true));
+    }
+
+    // A command of the host program as a person runs it: what it printed and its exit status.
+    void Pexupdate(const std::string& line) {
+        if (handles_ < 0) handles_ = OpenHandles();
+        const pextest::CommandOutcome o =
+            pextest::RunPexupdate(PEXUPDATE_PATH, *machine_, line.substr(line.find("pexupdate") + 10));
+        output_ += "#### " + line + "\n" + Normalised(o.out, false) + "exit " + std::to_string(o.exit) + "\n";
     }
 
     // Time stamps, the build's own folder and temporary names differ from machine to machine.
@@ -394,7 +409,7 @@ private:
     plat::files::FileTime clock_ = 0;
     int crashAt_ = 0;
     int handles_ = -1;
-    std::string trace_, progress_;
+    std::string trace_, progress_, output_;
 };
 
 }  // namespace

@@ -142,12 +142,4 @@ TEST_F(StatusReport, TheLastRunIsTheNewestOneInTheLogOrItsBackup) {
     EXPECT_EQ(status::ExitCode(report), 0);
 }
 
-TEST_F(StatusReport, AProductThatIsNotRegisteredCannotBeReported) {
-    Publish("Fine", {});
-    status::Report report;
-    std::string error;
-    EXPECT_FALSE(status::Gather("Other", trace.Path(), &report, &error));
-    EXPECT_EQ(error, "no product 'Other' is registered below HKLM\\software\\vantric\\Pex");
-}
-
 }  // namespace
