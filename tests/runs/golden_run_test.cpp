@@ -229,7 +229,9 @@ private:
 
     // One run: the host's UpdateAll (as Mendler.dll does when a host loads it) or one product.
     void Run(const std::vector<std::string>& w, const std::string& line) {
-        golden::Run run{w.size() > 2 && w[1] == "product" ? w[2] : "", w.back() == "nested"};
+        const std::size_t nested = line.find(" nested");
+        golden::Run run{w.size() > 2 && w[1] == "product" ? w[2] : "", nested != std::string::npos,
+                        nested == std::string::npos ? "" : line.substr(std::min(line.size(), nested + 8))};
         if (crashAt_ > 0) {
             progress_ += line + ": cut off before its mutating operation " + std::to_string(crashAt_) + ": " +
                          golden::RunCutOff(run, crashAt_) + "\n";
