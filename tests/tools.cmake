@@ -10,8 +10,3 @@ pex_add_test(tools_progress_tracker_test
   SOURCES ${CMAKE_CURRENT_SOURCE_DIR}/tools/progress_tracker_test.cpp ${PROJECT_SOURCE_DIR}/tools/progress_tracker.cpp
   LIBS mendler_core)
 
-# `pexupdate status` over products that failed, wait for the restart, were interrupted or were
-# kept aside, on the emulated machine.
-pex_add_test(tools_status_report_test
-  SOURCES ${CMAKE_CURRENT_SOURCE_DIR}/pipeline/pipeline_fixture.cpp ${CMAKE_CURRENT_SOURCE_DIR}/tools/status_report_test.cpp
-  LIBS mendler_core pex_status)

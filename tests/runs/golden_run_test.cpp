@@ -246,12 +246,20 @@ private:
         trace_ += "#### " + line + "\n" + SortedValues(Normalised(Slurp(plat::paths::ToHost(kLog)), true));
     }
 
-    // A command of the host program as a person runs it: what it printed and its exit status.
+    // A command of the host program as a person runs it: what it printed and its exit status. It
+    // runs from a copy beside the library's module, so that it reads the trace log of the runs.
     void Pexupdate(const std::string& line) {
         if (handles_ < 0) handles_ = OpenHandles();
+        const std::string program = "C:\\Mendler\\pexupdate";
+        if (!plat::files::Exists(program)) {
+            PlaceModule("Mendler.dll", kModule);
+            fs::copy_file(PEXUPDATE_PATH, plat::paths::ToHost(program));
+            modules_.push_back(program);
+        }
         const pextest::CommandOutcome o =
-            pextest::RunPexupdate(PEXUPDATE_PATH, *machine_, line.substr(line.find("pexupdate") + 10));
-        output_ += "#### " + line + "\n" + Normalised(o.out, false) + "exit " + std::to_string(o.exit) + "\n";
+            pextest::RunPexupdate(plat::paths::ToHost(program), *machine_, line.substr(line.find("pexupdate") + 10));
+        const std::string out = std::regex_replace(o.out, std::regex("\\d{4}/\\d\\d/\\d\\d - [0-9:.]{12}"), "<time>");
+        output_ += "#### " + line + "\n" + Normalised(out, false) + "exit " + std::to_string(o.exit) + "\n";
     }
 
     // Time stamps, the build's own folder and temporary names differ from machine to machine.
