@@ -242,8 +242,14 @@ private:
         progress_ += line + "\n";
         const std::string result = golden::RunHere(run, kModule, &progress_);
         progress_ += "returned " + result + "\n";
-        // The support snapshot lists registry values too.
-        trace_ += "#### " + line + "\n" + SortedValues(Normalised(Slurp(plat::paths::ToHost(kLog)), true));
+        KeepLog(line);
+    }
+
+    // The trace log after a line that wrote one; the support snapshot lists registry values too.
+    void KeepLog(const std::string& line) {
+        const std::string log = Slurp(plat::paths::ToHost(kLog));
+        if (log != lastLog_) trace_ += "#### " + line + "\n" + SortedValues(Normalised(log, true));
+        lastLog_ = log;
     }
 
     // A command of the host program as a person runs it: what it printed and its exit status. It
@@ -258,8 +264,10 @@ private:
         }
         const pextest::CommandOutcome o =
             pextest::RunPexupdate(plat::paths::ToHost(program), *machine_, line.substr(line.find("pexupdate") + 10));
-        const std::string out = std::regex_replace(o.out, std::regex("\\d{4}/\\d\\d/\\d\\d - [0-9:.]{12}"), "<time>");
+        std::string out = std::regex_replace(o.out, std::regex("\\d{4}/\\d\\d/\\d\\d - [0-9:.]{12}"), "<time>");
+        out = std::regex_replace(out, std::regex(Escaped(machine_->Root())), "<machine>");
         output_ += "#### " + line + "\n" + Normalised(out, false) + "exit " + std::to_string(o.exit) + "\n";
+        KeepLog(line);  // `all` and `product` run the library, which writes its log
     }
 
     // Time stamps, the build's own folder and temporary names differ from machine to machine.
@@ -419,7 +427,7 @@ private:
     plat::files::FileTime clock_ = 0;
     int crashAt_ = 0;
     int handles_ = -1;
-    std::string trace_, progress_, output_;
+    std::string trace_, progress_, output_, lastLog_;
 };
 
 }  // namespace
