@@ -242,13 +242,13 @@ private:
         progress_ += line + "\n";
         const std::string result = golden::RunHere(run, kModule, &progress_);
         progress_ += "returned " + result + "\n";
-        KeepLog(line);
+        KeepLog(line, true);
     }
 
-    // The trace log after a line that wrote one; the support snapshot lists registry values too.
-    void KeepLog(const std::string& line) {
+    // The trace log after a run, or after a command that wrote one; the support snapshot lists registry values too.
+    void KeepLog(const std::string& line, bool always = false) {
         const std::string log = Slurp(plat::paths::ToHost(kLog));
-        if (log != lastLog_) trace_ += "#### " + line + "\n" + SortedValues(Normalised(log, true));
+        if (always || log != lastLog_) trace_ += "#### " + line + "\n" + SortedValues(Normalised(log, true));
         lastLog_ = log;
     }
 
