@@ -262,8 +262,13 @@ private:
             fs::copy_file(PEXUPDATE_PATH, plat::paths::ToHost(program));
             modules_.push_back(program);
         }
-        const pextest::CommandOutcome o =
-            pextest::RunPexupdate(plat::paths::ToHost(program), *machine_, line.substr(line.find("pexupdate") + 10));
+        // "ARGS <<< TEXT" answers its prompts with TEXT, from a file beside the machine's drives.
+        std::string args = line.substr(line.find("pexupdate") + 10);
+        const std::string input = machine_->Root() + "/input.txt";
+        const std::size_t answers = args.find(" <<< ");
+        std::ofstream(input, std::ios::binary) << (answers == std::string::npos ? "" : args.substr(answers + 5) + "\n");
+        args = args.substr(0, answers) + " <'" + input + "'";
+        const pextest::CommandOutcome o = pextest::RunPexupdate(plat::paths::ToHost(program), *machine_, args);
         std::string out = std::regex_replace(o.out, std::regex("\\d{4}/\\d\\d/\\d\\d - [0-9:.]{12}"), "<time>");
         out = std::regex_replace(out, std::regex(Escaped(machine_->Root())), "<machine>");
         output_ += "#### " + line + "\n" + Normalised(out, false) + "exit " + std::to_string(o.exit) + "\n";
