@@ -126,17 +126,4 @@ TEST_F(ManifestParser, ARunKeepsNothingOfTheContentFileOfTheRunBefore) {
     EXPECT_FALSE(parser.MoveToRow(0));
 }
 
-// A table without a column the analysis needs is rejected as a malformed one is (the golden run
-// content_file_not_loaded shows that): moved aside, its entries removed, counted as a failure.
-TEST_F(ManifestParser, ATableWithoutAStatusColumnIsRejected) {
-    const std::string bytes = "FileName,Status\r\na.dll,Downloaded\r\n";
-    Publish("", bytes);
-    EXPECT_EQ(parser.ProcessUpdateInformation(_bstr_t("Zendor32"), nullptr), 1);
-    EXPECT_TRUE(trace.Contains("CManifestParser: ProcessUpdateInformation, content file '" + std::string(kContent) +
-                               "' rejected: there is no column UpgradeStatus"));
-    EXPECT_EQ(machine.ReadFile(std::string(kContent) + ".rejected"), bytes);
-    std::string entry;
-    EXPECT_FALSE(pextest::GetRegValue(reg::kLocalMachine, kSection, "ContentFileName", &entry));
-}
-
 }  // namespace
