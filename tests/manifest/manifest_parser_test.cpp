@@ -43,18 +43,6 @@ protected:
     CManifestParser parser;
 };
 
-TEST_F(ManifestParser, BranchesComeFromTheSitesApplicationProfile) {
-    Set(kSection, "Site", "server1/pub");
-    Set(kSection, "PromptThreshold", "ignored: read from the application profile");
-    pextest::SetRegText(reg::kCurrentUser, "Software\\Vantric\\Mendler\\URLs\\server1", "PBranch", "beta");
-    pextest::SetRegText(reg::kCurrentUser, "Software\\Vantric\\Mendler\\URLs\\server1", "UBranch", "stable");
-    pextest::SetRegText(reg::kCurrentUser, "Software\\Vantric\\Mendler\\Zendor32", "PromptThreshold", "x7");
-    parser.Init("Zendor32");
-    EXPECT_EQ(parser.PBranch(), "beta");
-    EXPECT_EQ(parser.UBranchSetting(), "stable");
-    EXPECT_EQ(parser.PromptThreshold(), 0);  // not a number
-}
-
 TEST_F(ManifestParser, DefaultPathIsReadFromTheSectionHeldBeforeInit) {
     Set("Software\\Vantric\\Pex", "DefaultPath", "C:\\Root");
     Set("Software\\Vantric\\Pex\\First", "DefaultPath", "C:\\First");
