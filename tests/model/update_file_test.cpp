@@ -1,15 +1,13 @@
-// CFile_ on an emulated machine: a command list of blanks, the setup fallback for a file new to
-// the machine, and the removal of downloads. Whole runs cover the rest: backups beside older ones
-// and rollbacks after a failed command (rollback_beside_backups, group_rollback_and_statuses),
-// install commands (install_commands), the setup fallback over an existing file (target_in_use).
+// CFile_ on an emulated machine: a command list of blanks and the removal of downloads. Whole
+// runs cover the rest: backups beside older ones and rollbacks after a failed command
+// (rollback_beside_backups, group_rollback_and_statuses), install commands (install_commands),
+// the setup fallback (setup_fallback, target_in_use).
 #include "model/update_file.h"
 
 #include <gtest/gtest.h>
 
 #include <string>
 
-#include "platform/errors.h"
-#include "platform/fault.h"
 #include "platform/files.h"
 #include "tests/support/test_machine.h"
 #include "tests/support/trace_capture.h"
@@ -17,12 +15,10 @@
 namespace {
 
 constexpr char kDownload[] = "C:\\Cache\\a.dll";
-constexpr char kTarget[] = "C:\\App\\Sub\\a.dll";
 
 class UpdateFile : public ::testing::Test {
 protected:
     void SetUp() override { machine.WriteFile(kDownload, "new"); }
-    void TearDown() override { plat::fault::Clear(); }
 
     // Row 7, installed into C:\App\Sub; the directory in the file name is not used.
     static CFile_ Make(const std::string& command = "", const std::string& date = "") {
@@ -41,20 +37,6 @@ protected:
 TEST_F(UpdateFile, BlanksAreRunAsACommandList) {
     EXPECT_EQ(1, Make("   ").Apply());
     EXPECT_TRUE(trace.Contains("CFile_: Command(s) found:    "));
-}
-
-TEST_F(UpdateFile, SetupFallbackCountsAsNotAppliedButIsUndoneWhenItInstalled) {
-    plat::fault::FailNth(plat::fault::Op::Copy, 1, plat::kErrorAccessDenied);
-    CFile_ file = Make();
-    EXPECT_EQ(0, file.Apply());
-    EXPECT_EQ("new", Read(kTarget));
-    EXPECT_TRUE(trace.Contains("CFile_: SetupInstallFileEx succeeded."));
-    EXPECT_TRUE(file.Rollback());
-    EXPECT_FALSE(Exists(kTarget));
-
-    CFile_ missing(8, true, false, "C:\\App\\Sub", "b.dll", "C:\\Cache\\b.dll", "", "", false, 0);
-    EXPECT_EQ(0, missing.Apply());
-    EXPECT_TRUE(trace.Contains("CFile_: SetupInstallFileEx failed, error code is 2"));
 }
 
 // A read-only download is removed all the same; a download that is the target itself never is.
