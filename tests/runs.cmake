@@ -4,9 +4,10 @@
 add_executable(golden_run_test ${CMAKE_CURRENT_SOURCE_DIR}/runs/golden_run_test.cpp
                                ${CMAKE_CURRENT_SOURCE_DIR}/runs/golden_child.cpp)
 target_link_libraries(golden_run_test PRIVATE mendler_core pex_test_support GTest::gtest)
-target_compile_definitions(golden_run_test PRIVATE PEX_RUNS_DIR="${CMAKE_CURRENT_SOURCE_DIR}/runs")
+target_compile_definitions(golden_run_test PRIVATE PEX_RUNS_DIR="${CMAKE_CURRENT_SOURCE_DIR}/runs"
+                                                  PEXUPDATE_PATH="$<TARGET_FILE:pexupdate>")
 pex_warnings(golden_run_test)
-add_dependencies(golden_run_test Mendler Rivzip pextestprog PexSelfReg PexNoSelfReg PexNoVersion)
+add_dependencies(golden_run_test pexupdate Mendler Rivzip pextestprog PexSelfReg PexNoSelfReg PexNoVersion)
 if(COMMAND pex_wine_test)
   pex_wine_test(golden_run_test)
 else()

@@ -1,19 +1,14 @@
-// One run at a time: a host that calls the library again while a run is in progress (from a
-// progress callback here; from a window message during a [RUN] wait on Windows) is refused
-// without effect, a product run of another process on the same machine is waited for, and the
-// trace file lost by one run is tried again by the next.
+// One run at a time on the machine: a lock left by a killed process is taken over, two hosts
+// started at once apply each file once, and the trace file lost by one run is tried again by
+// the next. A host that calls again while a run is in progress is the golden runs'
+// (nested_while_applying, nested_in_product_run, host_calls_twice).
 #include <gtest/gtest.h>
-
-#include <filesystem>
-#include <functional>
-#include <map>
 
 #include "entry/run_guard.h"
 #include "entry/update_all.h"
 #include "manifest/manifest_parser.h"
 #include "platform/files.h"
 #include "platform/machine.h"
-#include "platform/paths.h"
 #include "tests/pipeline/pipeline_fixture.h"
 #include "tests/support/test_registry.h"
 
@@ -24,71 +19,17 @@
 #endif
 
 using pextest::ContentRow;
-using Lines = std::vector<std::string>;
 
 namespace {
-
-const std::string kRefusedProduct =
-    "CManifestParser: ProcessUpdateInformation, a run is already in progress in this process, returning 1";
-const std::string kRefusedUpdateAll = "UpdateAll, a run is already in progress in this process, returning at once";
-
-// What the host does from its progress callback, once, at the first report whose status text
-// starts with g_reenterAt (empty: the first report of all).
-std::function<void()> g_reenter;
-std::string g_reenterAt;
-int g_innerCalls = 0;
-
-bool Outer(CProgressData* progress) {
-    if (g_reenter && std::string(progress->StatusText).rfind(g_reenterAt, 0) == 0) {
-        const std::function<void()> reenter = std::move(g_reenter);
-        g_reenter = nullptr;
-        reenter();
-    }
-    return false;
-}
-
-bool Inner(CProgressData*) {
-    ++g_innerCalls;
-    return false;
-}
 
 class RunGuard : public pextest::PipelineTest {
 protected:
     void SetUp() override {
-        g_innerCalls = 0;
         for (const char* name : {"a.dll", "b.dll"}) machine.WriteFile(std::string(kHome) + "\\" + name, "old");
         Publish({Row("a.dll", "new a", "G"), Row("b.dll", "new b", "G")});
     }
     void TearDown() override {
-        g_reenter = nullptr;
         plat::SetMachineLockWaitCap(plat::kNoMachineLockWaitCap);
-    }
-
-    // Every file below C:\App and C:\Pex with its bytes, and whether the product's content file
-    // entries are in the registry: what a run may change.
-    std::map<std::string, std::string> State() const {
-        std::map<std::string, std::string> state;
-        for (const char* folder : {"App", "Pex"})
-            for (const auto& entry : std::filesystem::recursive_directory_iterator(
-                     std::filesystem::path(plat::paths::ToHost(std::string("C:\\") + folder))))
-                if (entry.is_regular_file())
-                    state[entry.path().string()] = pextest::ReadHostFile(entry.path().string());
-        state["registry entries"] = ContentEntriesPresent() ? "present" : "gone";
-        return state;
-    }
-
-    // Called from the middle of a run, both entries trace their one line and return at once:
-    // nothing on disk or in the registry changes and the host's callback is not called.
-    void ReenterBothEntries(CManifestParser& inner) {
-        const auto before = State();
-        const std::size_t linesBefore = trace.Lines().size();
-        EXPECT_FALSE(UpdateAll(&Inner));
-        EXPECT_EQ(inner.ProcessUpdateInformation(_bstr_t(kProduct), &Inner), 1);
-        const Lines lines = trace.Lines();
-        EXPECT_EQ(Lines(lines.begin() + static_cast<std::ptrdiff_t>(linesBefore), lines.end()),
-                  (Lines{kRefusedUpdateAll, kRefusedProduct}));
-        EXPECT_EQ(State(), before);
-        EXPECT_EQ(g_innerCalls, 0);
     }
 
     void ExpectApplied() const {
@@ -97,34 +38,6 @@ protected:
         EXPECT_FALSE(ContentEntriesPresent());
     }
 };
-
-// The outer run is UpdateAll re-entered in a product run (backups made), or a parser that the
-// host drives alone (the golden run host_calls_twice re-enters UpdateAll between products).
-TEST_F(RunGuard, ANestedCallIsRefusedAndTheRunGoesOn) {
-    CManifestParser outer, inner;
-    const struct {
-        const char* at;
-        bool byParser;
-    } cases[] = {{"Applying ", false}, {"Applying ", true}};
-    for (const auto& c : cases) {
-        SCOPED_TRACE(std::string(c.at) + (c.byParser ? "by the parser" : "by UpdateAll"));
-        Publish({Row("a.dll", "new a", "G"), Row("b.dll", "new b", "G")});
-        g_reenterAt = c.at;
-        g_reenter = [&] { ReenterBothEntries(inner); };
-        if (c.byParser) {
-            EXPECT_EQ(outer.ProcessUpdateInformation(_bstr_t(kProduct), &Outer), 0);
-        } else {
-            EXPECT_FALSE(UpdateAll(&Outer));
-        }
-        EXPECT_FALSE(g_reenter) << "the callback did not re-enter";
-        ExpectApplied();
-    }
-
-    // Runs that follow one another are not nested.
-    Publish({Row("a.dll", "newer a")});
-    EXPECT_EQ(inner.ProcessUpdateInformation(_bstr_t(kProduct), nullptr), 0);
-    EXPECT_EQ(Installed("a.dll"), "newer a");
-}
 
 // A trace file that cannot be opened is lost for the rest of that run only.
 TEST_F(RunGuard, EachRunTriesALostTraceFileAgain) {

@@ -43,18 +43,6 @@ protected:
     CManifestParser parser;
 };
 
-TEST_F(ManifestParser, BranchesComeFromTheSitesApplicationProfile) {
-    Set(kSection, "Site", "server1/pub");
-    Set(kSection, "PromptThreshold", "ignored: read from the application profile");
-    pextest::SetRegText(reg::kCurrentUser, "Software\\Vantric\\Mendler\\URLs\\server1", "PBranch", "beta");
-    pextest::SetRegText(reg::kCurrentUser, "Software\\Vantric\\Mendler\\URLs\\server1", "UBranch", "stable");
-    pextest::SetRegText(reg::kCurrentUser, "Software\\Vantric\\Mendler\\Zendor32", "PromptThreshold", "x7");
-    parser.Init("Zendor32");
-    EXPECT_EQ(parser.PBranch(), "beta");
-    EXPECT_EQ(parser.UBranchSetting(), "stable");
-    EXPECT_EQ(parser.PromptThreshold(), 0);  // not a number
-}
-
 TEST_F(ManifestParser, DefaultPathIsReadFromTheSectionHeldBeforeInit) {
     Set("Software\\Vantric\\Pex", "DefaultPath", "C:\\Root");
     Set("Software\\Vantric\\Pex\\First", "DefaultPath", "C:\\First");
@@ -124,19 +112,6 @@ TEST_F(ManifestParser, ARunKeepsNothingOfTheContentFileOfTheRunBefore) {
     EXPECT_EQ(parser.ContentFileTarget(), "");
     EXPECT_FALSE(parser.MandatoryOnly());
     EXPECT_FALSE(parser.MoveToRow(0));
-}
-
-// A table without a column the analysis needs is rejected as a malformed one is (the golden run
-// content_file_not_loaded shows that): moved aside, its entries removed, counted as a failure.
-TEST_F(ManifestParser, ATableWithoutAStatusColumnIsRejected) {
-    const std::string bytes = "FileName,Status\r\na.dll,Downloaded\r\n";
-    Publish("", bytes);
-    EXPECT_EQ(parser.ProcessUpdateInformation(_bstr_t("Zendor32"), nullptr), 1);
-    EXPECT_TRUE(trace.Contains("CManifestParser: ProcessUpdateInformation, content file '" + std::string(kContent) +
-                               "' rejected: there is no column UpgradeStatus"));
-    EXPECT_EQ(machine.ReadFile(std::string(kContent) + ".rejected"), bytes);
-    std::string entry;
-    EXPECT_FALSE(pextest::GetRegValue(reg::kLocalMachine, kSection, "ContentFileName", &entry));
 }
 
 }  // namespace

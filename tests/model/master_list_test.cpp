@@ -1,14 +1,15 @@
-// CFileGroup and CMasterList: dependency lists, the group's decompressed and applied states,
-// where files go, the order of a walk over the groups, the files-added count and the dependency
-// check that holds a group back.
+// CFileGroup and CMasterList: dependency lists, where files go, the order of a walk over the
+// groups, the files-added count and the dependency check that holds a group back. A group's
+// members in the order added, and its applied and decompressed states, which the first member
+// not yet so decides, show in every golden run (group_rollback_and_statuses, decompress_failures).
 #include "model/master_list.h"
 
 #include <gtest/gtest.h>
 
-#include <set>
 #include <string>
 #include <vector>
 
+#include "tests/support/case_file.h"
 #include "tests/support/test_machine.h"
 #include "tests/support/trace_capture.h"
 
@@ -16,54 +17,20 @@ namespace {
 
 using Lines = std::vector<std::string>;
 
-CFile_ Row(std::uint32_t row, bool applied = false, bool needsDecompression = false) {
+CFile_ Row(std::uint32_t row) {
     const std::string name = "f" + std::to_string(row) + ".dll";
-    return CFile_(row, true, applied, "C:\\App", name, "C:\\Cache\\" + name, "", "", needsDecompression,
-                  needsDecompression ? 1 : 0);
+    return CFile_(row, true, false, "C:\\App", name, "C:\\Cache\\" + name, "", "", false, 0);
 }
 
-TEST(FileGroup, DependancyListsSplitAtSemicolonsIntoTrimmedNamesKeptAsWritten) {
-    const struct {
-        const char* text;
-        bool result;
-        std::set<std::string> names;
-    } cases[] = {
-        {"A; B", true, {"A", "B"}},
-        {"A;  \t", true, {"A"}},
-        {" \n ", true, {}},
-        {"A;;B", true, {"", "A", "B"}},
-        {";A", true, {"", "A"}},
-        {"A;a; A", false, {"A", "a"}},  // the repeat is reported and kept once
-        {"b\r;A", true, {"A", "b\r"}},  // carriage returns are kept
-    };
-    for (const auto& c : cases) {
+TEST(FileGroup, DependancyListsOfTheCaseFile) {
+    for (const pextest::Case& c : pextest::ReadCases("model/cases/dependancy_lists.txt")) {
+        SCOPED_TRACE(c.where);
         CFileGroup group("G");
-        EXPECT_EQ(c.result, group.AddDependancies(c.text)) << c.text;
-        EXPECT_EQ(c.names, group.GetDependancies()) << c.text;
+        EXPECT_EQ(c[1] == "true", group.AddDependancies(pextest::Unescape(c[0])));
+        std::string names;
+        for (const std::string& name : group.GetDependancies()) names += "[" + name + "]";
+        EXPECT_EQ(pextest::Unescape(c[2]), names.empty() ? "none" : names);
     }
-}
-
-TEST(FileGroup, MembersKeepTheirOrderAndTheFirstUnappliedOneDecides) {
-    pextest::TestMachine machine;
-    CFileGroup group("G");
-    EXPECT_TRUE(group.IsGroupApplied());
-    EXPECT_TRUE(group.IsGroupDecompressed());
-    group.AddFileToGroup(Row(3, true));
-    group.AddFileToGroup(Row(1, false, true));
-    EXPECT_TRUE(group.AddFileAndDependancies(Row(2), ""));
-    std::vector<std::uint32_t> rows;
-    for (const CFile_& file : group.GetFiles()) rows.push_back(file.GetRow());
-    EXPECT_EQ(rows, (std::vector<std::uint32_t>{3, 1, 2}));
-
-    pextest::TraceCapture trace;
-    EXPECT_FALSE(group.IsGroupApplied());
-    EXPECT_FALSE(group.IsGroupDecompressed());
-    EXPECT_EQ(trace.Lines(), (Lines{
-        "File 'f3.dll' is applied",
-        "File 'f1.dll' is not applied",
-        "CFileGroup: IsGroupApplied complete 0",
-        "CFileGroup: IsGroupDecompressed complete 0",
-    }));
 }
 
 // "key:name:rows" for every group, in walk order.

@@ -32,7 +32,7 @@ Run g_run;  // the run in progress
 
 bool Record(CProgressData* p) {
     if (!g_progress) return false;
-    if (g_run.nested) {  // a host that calls again from its callback
+    if (g_run.nested && std::string(p->StatusText).rfind(g_run.nestAt, 0) == 0) {  // a host calls again
         g_run.nested = false;
         *g_progress += "  nested UpdateAll returned " + std::string(UpdateAll(nullptr) ? "true" : "false") + "\n";
         CManifestParser parser;
@@ -101,7 +101,7 @@ int ChildMain() {
     plat::machine::Ensure();
     plat::fault::CrashAtMutation(std::stoi(request.substr(0, blank)));
     g_TraceLog.enabled = false;
-    Call(Run{blank == std::string::npos ? "" : request.substr(blank + 1)});
+    Call(Run{blank == std::string::npos ? "" : request.substr(blank + 1), false, ""});
     return 0;
 }
 

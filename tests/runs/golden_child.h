@@ -9,6 +9,7 @@ namespace golden {
 struct Run {
     std::string product;  // empty: UpdateAll over every product
     bool nested = false;  // the callback's first report calls UpdateAll and the product run again
+    std::string nestAt;   // ... or its first report whose status text starts with this
 };
 
 // Another process's product run holds the machine's update lock while this object lives (a

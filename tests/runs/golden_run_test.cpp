@@ -32,6 +32,7 @@
 #include "platform/setup_install.h"
 #include "tests/runs/golden_child.h"
 #include "tests/support/platform_guard.h"
+#include "tests/support/run_pexupdate.h"
 #include "tests/support/test_machine.h"
 
 namespace fs = std::filesystem;
@@ -123,6 +124,10 @@ public:
     explicit GoldenRun(fs::path folder) : folder_(std::move(folder)) {}
 
     void TestBody() override {
+#ifdef _WIN32
+        if (Slurp(folder_ / "scenario.txt").find("\npexupdate ") != std::string::npos)
+            GTEST_SKIP() << "the host program's commands are given to a POSIX shell";
+#endif
         if (!golden::IsScenarioProcess()) {
             const std::string name = "golden." + folder_.filename().string();
             EXPECT_EQ(golden::RunScenarioAlone(name), 0) << name << " failed in its own process (its output is above)";
@@ -146,6 +151,7 @@ public:
             else if (w[0] == "lock") lock = std::make_unique<golden::LockHolder>();
             else if (w[0] == "module") PlaceModule(w.at(1), line.substr(line.find(w.at(2))));
             else if (w[0] == "run") Run(w, line);
+            else if (w[0] == "pexupdate") Pexupdate(line);
             else ADD_FAILURE() << "unknown directive: " << line;
         }
         EXPECT_EQ(OpenHandles(), handles_) << "a run left a file handle open";
@@ -160,6 +166,7 @@ public:
         Compare("files.txt", Files());
         Compare("registry.reg", Registry());
         Compare("restart.txt", RestartQueue());
+        if (!output_.empty()) Compare("output.txt", output_);
         CompareContentFiles();
     }
 
@@ -222,7 +229,9 @@ private:
 
     // One run: the host's UpdateAll (as Mendler.dll does when a host loads it) or one product.
     void Run(const std::vector<std::string>& w, const std::string& line) {
-        golden::Run run{w.size() > 2 && w[1] == "product" ? w[2] : "", w.back() == "nested"};
+        const std::size_t nested = line.find(" nested");
+        golden::Run run{w.size() > 2 && w[1] == "product" ? w[2] : "", nested != std::string::npos,
+                        nested == std::string::npos ? "" : line.substr(std::min(line.size(), nested + 8))};
         if (crashAt_ > 0) {
             progress_ += line + ": cut off before its mutating operation " + std::to_string(crashAt_) + ": " +
                          golden::RunCutOff(run, crashAt_) + "\n";
@@ -233,8 +242,37 @@ private:
         progress_ += line + "\n";
         const std::string result = golden::RunHere(run, kModule, &progress_);
         progress_ += "returned " + result + "\n";
-        // The support snapshot lists registry values too.
-        trace_ += "#### " + line + "\n" + SortedValues(Normalised(Slurp(plat::paths::ToHost(kLog)), true));
+        KeepLog(line, true);
+    }
+
+    // The trace log after a run, or after a command that wrote one; the support snapshot lists registry values too.
+    void KeepLog(const std::string& line, bool always = false) {
+        const std::string log = Slurp(plat::paths::ToHost(kLog));
+        if (always || log != lastLog_) trace_ += "#### " + line + "\n" + SortedValues(Normalised(log, true));
+        lastLog_ = log;
+    }
+
+    // A command of the host program as a person runs it: what it printed and its exit status. It
+    // runs from a copy beside the library's module, so that it reads the trace log of the runs.
+    void Pexupdate(const std::string& line) {
+        if (handles_ < 0) handles_ = OpenHandles();
+        const std::string program = "C:\\Mendler\\pexupdate";
+        if (!plat::files::Exists(program)) {
+            PlaceModule("Mendler.dll", kModule);
+            fs::copy_file(PEXUPDATE_PATH, plat::paths::ToHost(program));
+            modules_.push_back(program);
+        }
+        // "ARGS <<< TEXT" answers its prompts with TEXT, from a file beside the machine's drives.
+        std::string args = line.substr(line.find("pexupdate") + 10);
+        const std::string input = machine_->Root() + "/input.txt";
+        const std::size_t answers = args.find(" <<< ");
+        std::ofstream(input, std::ios::binary) << (answers == std::string::npos ? "" : args.substr(answers + 5) + "\n");
+        args = args.substr(0, answers) + " <'" + input + "'";
+        const pextest::CommandOutcome o = pextest::RunPexupdate(plat::paths::ToHost(program), *machine_, args);
+        std::string out = std::regex_replace(o.out, std::regex("\\d{4}/\\d\\d/\\d\\d - [0-9:.]{12}"), "<time>");
+        out = std::regex_replace(out, std::regex(Escaped(machine_->Root())), "<machine>");
+        output_ += "#### " + line + "\n" + Normalised(out, false) + "exit " + std::to_string(o.exit) + "\n";
+        KeepLog(line);  // `all` and `product` run the library, which writes its log
     }
 
     // Time stamps, the build's own folder and temporary names differ from machine to machine.
@@ -394,7 +432,7 @@ private:
     plat::files::FileTime clock_ = 0;
     int crashAt_ = 0;
     int handles_ = -1;
-    std::string trace_, progress_;
+    std::string trace_, progress_, output_, lastLog_;
 };
 
 }  // namespace

@@ -2,9 +2,11 @@
 // and ProcessUpdateInformation send, in the order they send it.
 #include <gtest/gtest.h>
 
+#include <sstream>
 #include <string>
 #include <vector>
 
+#include "tests/support/case_file.h"
 #include "tools/progress_tracker.h"
 
 namespace {
@@ -50,49 +52,38 @@ std::vector<Event> Product(std::int32_t rows, std::int32_t steps) {
     return events;
 }
 
-std::vector<Event> Join(std::vector<std::vector<Event>> parts) {
-    std::vector<Event> all;
-    for (auto& part : parts) all.insert(all.end(), part.begin(), part.end());
-    return all;
+// The events of a case's text (its file says how they are written).
+std::vector<Event> Parse(const std::string& text) {
+    std::vector<Event> events;
+    std::istringstream in(text);
+    for (std::string t; in >> t;) {
+        if (t == "I") events.push_back(Increment());
+        else if (t[0] == 'T') events.push_back(Total(std::stoi(t.substr(1))));
+        else if (t == "A") events.push_back(Status("Analyzing data..."));
+        else if (t[0] == 'A') events.push_back(Status("Analyzing " + t.substr(1)));
+        else if (t == "D") events.push_back(Status("Decompressing..."));
+        else if (t == "F") events.push_back(Status("Finished."));
+        else if (t[0] == 'P') {
+            const std::vector<Event> product = Product(std::stoi(t.substr(1)), std::stoi(t.substr(t.find('x') + 1)));
+            events.insert(events.end(), product.begin(), product.end());
+        } else ADD_FAILURE() << "unknown event " << t;
+    }
+    return events;
 }
 
-TEST(ProgressTracker, EachProductCountsItsOwnStepsAgainstItsOwnTotal) {
-    struct Case {
-        const char* name;
-        std::vector<Event> events;
-        std::vector<std::string> lastShownOfEachProduct;  // after its "Finished."
-    } cases[] = {
-        {"two products of two steps", Join({{Total(2), Increment()}, Product(1, 2), {Increment()}, Product(2, 2)}),
-         {"2/2 1 of 2", "2/2 2 of 2"}},
-        {"a product total equal to the product count",
-         Join({{Total(3), Increment()}, Product(1, 3), {Increment()}, Product(1, 1), {Increment()}, Product(0, 3)}),
-         {"3/3 1 of 3", "1/1 2 of 3", "3/3 3 of 3"}},
-        {"a product without a content file", Join({{Total(2), Increment(), Status("Analyzing data..."),
-                                                    Status("Finished."), Increment()},
-                                                   Product(1, 4)}),
-         {"0/0 1 of 2", "4/4 2 of 2"}},
-        {"a product run on its own", Product(2, 3), {"3/3 0 of 0"}},
-    };
-    for (const Case& c : cases) {
-        SCOPED_TRACE(c.name);
+TEST(ProgressTracker, ShownOverRecordedSequences) {
+    for (const pextest::Case& c : pextest::ReadCases("tools/cases/progress_tracker.txt")) {
+        SCOPED_TRACE(c.where);
         CProgressData record;
         pextool::ProgressTracker tracker;
-        const std::vector<std::string> shown = Replay(record, tracker, c.events);
-        std::vector<std::string> finished;
-        for (std::size_t i = 0; i < c.events.size(); ++i)
-            if (c.events[i].kind == Event::Status && c.events[i].text == "Finished.") finished.push_back(shown[i]);
-        EXPECT_EQ(finished, c.lastShownOfEachProduct);
+        const std::vector<Event> events = Parse(c[1]);
+        const std::vector<std::string> shown = Replay(record, tracker, events);
+        std::string out;
+        for (std::size_t i = 0; i < events.size(); ++i)
+            if (c[0] == "every" || (events[i].kind == Event::Status && events[i].text == "Finished."))
+                out += (out.empty() ? "" : ", ") + shown[i];
+        EXPECT_EQ(out, c[2]);
     }
-}
-
-TEST(ProgressTracker, AProductsTotalIsUnknownUntilItsAnalysisEnds) {
-    CProgressData record;
-    pextool::ProgressTracker tracker;
-    const std::vector<std::string> shown = Replay(
-        record, tracker, {Total(2), Increment(), Status("Analyzing data..."), Status("Analyzing a"), Total(5),
-                          Status("Decompressing..."), Increment()});
-    EXPECT_EQ(shown, (std::vector<std::string>{"0/0 0 of 2", "0/0 1 of 2", "0/0 1 of 2", "0/0 1 of 2", "0/5 1 of 2",
-                                               "0/5 1 of 2", "1/5 1 of 2"}));
 }
 
 // The record is the process's own: a second UpdateAll in the same process starts from the steps
@@ -100,7 +91,7 @@ TEST(ProgressTracker, AProductsTotalIsUnknownUntilItsAnalysisEnds) {
 TEST(ProgressTracker, StepsLeftByEarlierRunsInTheProcessDoNotCount) {
     CProgressData record;
     pextool::ProgressTracker first;
-    const std::vector<Event> run = Join({{Total(2), Increment()}, Product(1, 3), {Increment()}, Product(1, 2)});
+    const std::vector<Event> run = Parse("T2 I P1x3 I P1x2");
     Replay(record, first, run);
     EXPECT_EQ(Replay(record, first, run).back(), "2/2 2 of 2");
     pextool::ProgressTracker late;
