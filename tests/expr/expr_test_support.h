@@ -36,21 +36,7 @@ public:
 // plan.Parse(text) with stdout (where the parser reports) captured into *output when given.
 bool QuietParse(ExecutionPlan& plan, const std::string& text, std::string* output = nullptr);
 
-// Parses text into a fresh plan.
-struct Parsed {
-    bool ok = false;
-    std::vector<std::string> items;  // ExpressionText of each item
-    std::string output;
-};
-Parsed ParseText(const std::string& text);
-
 // The expression of "FORCED = <text>", unvalidated, for evaluating it directly.
 COverrideExpression ParseExpression(const std::string& text);
-
-// Runs the plan's validation and returns its comments, or {"valid"} when it passed.
-std::vector<std::string> ValidationOf(const std::string& text);
-
-// The message of the failure object that evaluating node throws; "no failure" otherwise.
-std::string FailureOf(const COverrideExpression& node, UpdateServices& services);
 
 }  // namespace exprtest

@@ -1,22 +1,23 @@
-// The scanner and the grammar, seen through the trees they build.
+// The scanner and the grammar, seen through the trees they build. Their bounds (script length,
+// depth, stack, token length) are hostile_scripts_test's.
 #include "expr/override_parser.h"
 
 #include <gtest/gtest.h>
 
+#include "expr/expression_text.h"
 #include "tests/expr/expr_test_support.h"
 #include "tests/support/case_file.h"
 
 namespace {
 
-using exprtest::ParseText;
-using Items = std::vector<std::string>;
-
-// The items a text parses to, or "refused: " and what the parser printed, then what it kept.
-std::string Outcome(const std::string& text) {
-    exprtest::Parsed parsed = ParseText(text);
-    std::string outcome;
-    if (!parsed.ok) outcome = "refused: " + parsed.output.substr(0, parsed.output.find('\n'));
-    for (const std::string& item : parsed.items) outcome += (outcome.empty() ? "" : "; ") + item;
+// The items a text parses to ("; " between them), after "refused: " and the parser's first
+// printed line when it refuses; *printed receives all it printed.
+std::string Outcome(const std::string& text, std::string* printed = nullptr) {
+    ExecutionPlan plan;
+    std::string output;
+    std::string outcome = exprtest::QuietParse(plan, text, &output) ? "" : "refused: " + output.substr(0, output.find('\n'));
+    for (const COverrideExpression& item : plan.Items()) outcome += (outcome.empty() ? "" : "; ") + ExpressionText(item);
+    if (printed) *printed = output;
     return outcome;
 }
 
@@ -28,46 +29,13 @@ TEST(OverrideParser, TreesOfTexts) {
     EXPECT_EQ(Outcome(""), "refused: syntax error");
     // A line feed in a string (or an escape) echoes what was gathered, which is dropped.
     for (const char* text : {"FORCED = \"ab\ncd\"", "FORCED = \"ab\\\ncd\""}) {
-        exprtest::Parsed parsed = ParseText(text);
-        EXPECT_EQ(parsed.output, "ab\n");
-        EXPECT_EQ(parsed.items, Items{"SET(FORCED, \"cd\")"});
+        std::string printed;
+        EXPECT_EQ(Outcome(text, &printed), "SET(FORCED, \"cd\")");
+        EXPECT_EQ(printed, "ab\n");
     }
-}
-
-TEST(OverrideScanner, ATokenReachingTheBufferLimitEndsOnlyThatParse) {
-    // The limit counts the token and its NUL (a string: what it gathered and its closing quote).
-    // Each token is followed by a blank: at the very end of a text the scanner also counts the
-    // end-of-buffer marker, one byte more.
-    const std::string name(8191, 'x'), text(8190, 's');
-    EXPECT_EQ(Outcome("FORCED = " + name + " "), "SET(FORCED, <unknown name>)");
-    EXPECT_EQ(Outcome("FORCED = \"" + text + "\" "), "SET(FORCED, \"" + text + "\")");
-    for (const std::string& tooLong : {"FORCED = " + name + "x ", "FORCED = \"" + text + "s\" "}) {
-        testing::internal::CaptureStderr();
-        EXPECT_EQ(Outcome(tooLong), "refused: ");
-        EXPECT_EQ(testing::internal::GetCapturedStderr(), "token too large, exceeds YYLMAX\n");
-        EXPECT_EQ(Outcome("FORCED = TRUE"), "SET(FORCED, TRUE)");  // the scanner was reset
-    }
-    testing::internal::CaptureStderr();
-    EXPECT_EQ(ParseOverrideText("FORCED = " + name + "x "), kParseScannerFailure);
-    testing::internal::GetCapturedStderr();
-}
-
-TEST(OverrideGrammar, StacksHoldTwoHundredStates) {
-    // 0, FORCED, = and one state per "(" are stacked, then the inner expression and ")".
-    auto nested = [](int depth) {
-        return "FORCED = " + std::string(depth, '(') + "TRUE" + std::string(depth, ')');
-    };
-    EXPECT_EQ(Outcome(nested(194)), "SET(FORCED, TRUE)");
-    EXPECT_EQ(Outcome(nested(195)), "refused: parser stack overflow");
-    std::string nots = "FORCED = ";
-    for (int i = 0; i < 300; ++i) nots += "NOT ";
-    EXPECT_EQ(Outcome(nots + "TRUE"), "refused: parser stack overflow");
-
-    testing::internal::CaptureStdout();
-    EXPECT_EQ(ParseOverrideText(nested(300)), kParseStackOverflow);
-    EXPECT_EQ(ParseOverrideText("FORCED = "), kParseSyntaxError);
-    EXPECT_EQ(ParseOverrideText(std::string("FORCED = TRUE\0; x", 17)), kParseAccepted);  // C text
-    testing::internal::GetCapturedStdout();
+    // The longest string a token holds is gathered whole.
+    const std::string longest(8190, 's');
+    EXPECT_EQ(Outcome("FORCED = \"" + longest + "\" "), "SET(FORCED, \"" + longest + "\")");
 }
 
 }  // namespace
