@@ -1,4 +1,5 @@
-// The executors of the built-in functions, evaluated directly on parsed (unvalidated) trees.
+// The executors of the built-in functions, evaluated directly on parsed (unvalidated) trees, and
+// the update services through which they reach the row.
 #include "expr/executors.h"
 
 #include <gtest/gtest.h>
@@ -55,12 +56,14 @@ TEST(Builtins, ValuesFailuresAndTheNamesTheyRead) {
 }
 
 // How lookups are indented by their nesting depth is pinned by the golden run scripts.
-TEST(Builtins, SetNestingAfterAFailureAndUnknownNames) {
+TEST(Builtins, SettingNestingAfterAFailureAndUnknownNames) {
     pextest::TestMachine machine;
     pextest::TraceCapture trace;
     TestRow row;
     EXPECT_EQ(Evaluate(ParseExpression("SET(HomeDir, \"D:\\\\x\")"), row.services).code, 0);
     EXPECT_EQ(row.Cell("HomeDir"), "D:\\x");
+    EXPECT_EQ(Evaluate(ParseExpression("SET(forced, TRUE)"), row.services).code, 0);
+    EXPECT_EQ(row.Cell("Force Download"), "1");
     Outcome("NOT BVAR", row);
     EXPECT_EQ(row.services.nestingLevel, 0);  // back after a failure
 
@@ -68,6 +71,15 @@ TEST(Builtins, SetNestingAfterAFailureAndUnknownNames) {
     EXPECT_THROW(GetVar(Node::FromText(Node::kFunc, "Nope"), row.services), Node);
     EXPECT_EQ(trace.Lines(), Lines{"Error finding Variable [Nope]: Unknown Name!"});
     EXPECT_NO_THROW(Evaluate(Node::FromText(Node::kFunc, "Nope"), row.services));
+
+    // Without a "Force Download" column, FORCED reads as an error value and cannot be set.
+    TestRow lean("Name,HomeDir", "a.dll,C:\\App");
+    const Node value = lean.services.GetSymbol("FORCED");
+    EXPECT_EQ(value.type, Node::kError);
+    EXPECT_EQ(value.code, Node::kUnexpected);
+    EXPECT_EQ(value.name, "Illegal attempt to get value for unknown symbol.");
+    Node yes = Node::FromBool(true);
+    EXPECT_EQ(lean.services.SetSymbol("FORCED", yes), Node::kUnexpected);
 }
 
 }  // namespace

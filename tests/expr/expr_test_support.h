@@ -22,10 +22,11 @@ public:
     std::vector<std::string> reads;
 };
 
-// A content table of one row built from a header and a data line, with recording services.
+// A content table of one row built from a header and a data line, with recording services. The
+// default header names two columns in another case than the scripts do: names match any case.
 class TestRow {
 public:
-    explicit TestRow(const std::string& header = "Force Download,HomeDir,FileName,AVAR",
+    explicit TestRow(const std::string& header = "FORCE DOWNLOAD,homedir,FileName,AVAR",
                      const std::string& line = "0,C:\\App,a.dll,1");
     std::string Cell(const std::string& column) const;
     CContentTable table;
