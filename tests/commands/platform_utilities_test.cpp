@@ -18,13 +18,9 @@ namespace {
 
 const char* const kPex = "software\\Vantric\\Pex";
 
-class UtilitiesTest : public ::testing::Test {
-protected:
-    pextest::TestMachine machine;
-};
-
 // Reading and deleting entries are also the manifest's tests, through the product settings.
-TEST_F(UtilitiesTest, ProfileReadsWritesAndDeletesEntries) {
+TEST(Utilities, ProfileReadsWritesAndDeletesEntries) {
+    pextest::TestMachine machine;
     CProfile profile;
     EXPECT_EQ(profile.ReadProfileEntry("Orlandel", "Site", "none"), "none");
     EXPECT_TRUE(pextest::RegKeyExists(reg::kLocalMachine, std::string(kPex) + "\\Orlandel"));  // made by the read
@@ -38,7 +34,8 @@ TEST_F(UtilitiesTest, ProfileReadsWritesAndDeletesEntries) {
     EXPECT_EQ(profile.ReadProfileEntry("", "Site", "gone"), "gone");
 }
 
-TEST_F(UtilitiesTest, TrailingBackslashesTemporaryNamesAndDirectoryTrees) {
+TEST(Utilities, TrailingBackslashesTemporaryNamesAndDirectoryTrees) {
+    pextest::TestMachine machine;
     EXPECT_EQ(AddTrailingBackslash(""), "\\");
     EXPECT_EQ(AddTrailingBackslash("C:\\a\\"), "C:\\a\\");
 

@@ -11,15 +11,16 @@
 
 namespace exprtest {
 
-// Services over one row that record the name of every GetSymbol before doing the real work.
+// Services over one row that record the name of every GetSymbol ("AVAR HomeDir") before doing
+// the real work.
 class RecordingServices : public UpdateServices {
 public:
     explicit RecordingServices(RowReference& row) : UpdateServices(row) {}
     COverrideExpression GetSymbol(std::string name) override {
-        reads.push_back(name);
+        reads += (reads.empty() ? "" : " ") + name;
         return UpdateServices::GetSymbol(name);
     }
-    std::vector<std::string> reads;
+    std::string reads;
 };
 
 // A content table of one row built from a header and a data line, with recording services. The

@@ -48,19 +48,8 @@ TEST(HostileScripts, TheBoundsAreExactAndSaySo) {
     }
 }
 
-// Runs the cases' scripts as the rows of one content file on a Windows-sized stack and expects
-// each row's "Force Download" cell.
-void ExpectForcedAfter(const Cases& cases) {
-    std::string content = "FileName,Force Download,DynamicFieldInfo\r\n";
-    for (std::size_t i = 0; i < cases.size(); ++i) content += std::to_string(i) + ",0," + Expand(cases[i][0]) + "\r\n";
-    CContentTable table;
-    ASSERT_GE(table.LoadFromText(content), 0);
-    testing::internal::CaptureStdout();
-    EXPECT_TRUE(pextest::RunOnStack(pextest::kWindowsMainStack, [&] { EvaluateDynamicFields(table); }));
-    testing::internal::GetCapturedStdout();
-    for (std::uint32_t row = 0; row < cases.size(); ++row) EXPECT_EQ(table.Cell(row, 1), cases[row][1]) << cases[row].where;
-}
-
+// The cases' scripts run as the rows of one content file on a Windows-sized stack; each row's
+// "Force Download" cell then shows how its plan ended.
 TEST(HostileScripts, EachRowsPlanFailsOrRunsOnItsOwn) {
     pextest::TestMachine machine;
     machine.WriteFile("C:\\App\\big.dll", pextest::ReadHostFile(PEX_FIXTURE_DIR "/versioned.dll"));
@@ -73,8 +62,15 @@ TEST(HostileScripts, EachRowsPlanFailsOrRunsOnItsOwn) {
     const Cases posix = pextest::ReadCases("expr/cases/hostile_rows_posix.txt");
     cases.insert(cases.end(), posix.begin(), posix.end());
 #endif
+    std::string content = "FileName,Force Download,DynamicFieldInfo\r\n";
+    for (std::size_t i = 0; i < cases.size(); ++i) content += std::to_string(i) + ",0," + Expand(cases[i][0]) + "\r\n";
+    CContentTable table;
+    ASSERT_GE(table.LoadFromText(content), 0);
     pextest::TraceCapture trace;
-    ExpectForcedAfter(cases);
+    testing::internal::CaptureStdout();
+    EXPECT_TRUE(pextest::RunOnStack(pextest::kWindowsMainStack, [&] { EvaluateDynamicFields(table); }));
+    testing::internal::GetCapturedStdout();
+    for (std::uint32_t row = 0; row < cases.size(); ++row) EXPECT_EQ(table.Cell(row, 1), cases[row][1]) << cases[row].where;
     EXPECT_TRUE(trace.Contains("ExecutionPlan: Parse, script too long, exceeds 65536 bytes"));
 }
 
