@@ -1,6 +1,7 @@
 // The install commands on an emulated machine: real programs (pextestprog), real files, the
 // registry, and the test modules PexSelfReg.dll, PexNoSelfReg.dll and PexNoVersion.dll, all
-// built beside this test program. The list rules (TRY-, traces) are command_string_test's.
+// built beside this test program. The list rules (TRY-, traces) are command_string_test's; the
+// golden run install_commands runs every kind of command within a product run.
 #include "commands/command_string.h"
 
 #include <gtest/gtest.h>
@@ -11,6 +12,7 @@
 #include "platform/cfile.h"
 #include "platform/fault.h"
 #include "platform/files.h"
+#include "tests/support/case_file.h"
 #include "tests/support/environment.h"
 #include "tests/support/test_machine.h"
 #include "tests/support/test_registry.h"
@@ -24,129 +26,68 @@ std::string AppFolder() {
     return app.substr(0, app.find_last_of('\\') + 1);
 }
 
-// The message a command without TRY- throws; empty when it runs through.
-std::string MessageOf(const std::string& commands, const std::string& base = "C:\\App") {
+// "ok", the message a command without TRY- throws, or the OS error of a file exception.
+std::string Outcome(const std::string& commands, const std::string& base = "C:\\App") {
     try {
-        CommandString(base).Execute(commands);
+        return CommandString(base).Execute(commands) ? "ok" : "failed";
     } catch (const char* message) {
         return message;
-    }
-    return "";
-}
-
-// The OS error of the file exception a deletion throws; 0 when it runs through.
-std::uint32_t FileErrorOf(const std::string& commands) {
-    try {
-        CommandString("C:\\App").Execute(commands);
     } catch (const plat::CFileException& e) {
-        return e.OsError();
+        return "os error " + std::to_string(e.OsError());
     }
-    return 0;
 }
 
-// A value's bytes as read back from the registry, after checking its type; empty when missing.
-std::string ReadValue(reg::HKey hive, const std::string& key, const std::string& name, std::uint32_t expectedType) {
+// A file's or a registry value's state after a command, in the form the case file gives it.
+std::string ReadBack(const pextest::Case& c) {
+    if (c.fields.size() == 4) return plat::files::Exists(c[2]) ? "kept" : "gone";
+    const reg::HKey root = c[2] == "HKCU" ? reg::kCurrentUser : reg::kLocalMachine;
     std::string bytes;
     std::uint32_t type = 0;
-    if (!pextest::GetRegValue(hive, key, name, &bytes, &type)) return "";
-    EXPECT_EQ(type, expectedType) << name;
-    return bytes;
+    if (!pextest::GetRegValue(root, c[3], c[4], &bytes, &type)) {
+        return pextest::RegKeyExists(root, c[3]) && c[5] == "key only" ? "key only" : "missing";
+    }
+    return std::string(type == reg::kRegDword ? "dword" : type == reg::kRegSz ? "string" : "other") + " | " + bytes;
 }
-// The four bytes of a DWORD value (little-endian, as Windows stores it).
-std::string Dword(std::uint32_t n) {
-    return {static_cast<char>(n), static_cast<char>(n >> 8), static_cast<char>(n >> 16), static_cast<char>(n >> 24)};
-}
-// A string value's bytes: its text with the terminating zero.
-std::string Sz(const std::string& text) { return text + '\0'; }
 
-TEST(ExecuteRun, RunsInTheBaseDirectoryIgnoringTheExitCodeAndFailsWhenAProgramDoesNotEnd) {
+TEST(Executors, CommandsAndWhatTheyLeave) {
     pextest::TestMachine m;
-    ASSERT_TRUE(plat::files::MakeDirectory("C:\\App"));
-    EXPECT_TRUE(CommandString("C:\\App\\").Execute("[RUN] pextestprog mark ran.txt; [RUN] pextestprog exit 7"));
-    EXPECT_EQ(m.ReadFile("C:\\App\\ran.txt"), "marked\n");
-    EXPECT_FALSE(plat::files::Exists("C:\\ran.txt"));
-    EXPECT_EQ(MessageOf("[RUN] nosuchprogram.exe; [RUN] pextestprog mark after.txt"), "process failed");
-    EXPECT_FALSE(plat::files::Exists("C:\\App\\after.txt"));
-
-    // Past the time-out the program is left running; it ends by itself soon after the test.
-    CommandString::SetRunTimeoutMs(1);
-    EXPECT_EQ(MessageOf("[RUN] pextestprog sleep 500", "C:\\"), "process failed");
-    CommandString::SetRunTimeoutMs(CommandString::kDefaultRunTimeoutMs);
-}
-
-TEST(ExecuteDel, BareNamesLieInTheBaseDirectoryAndFailuresThrowTheSystemError) {
-    pextest::TestMachine m;
-    const char* const deleted[] = {"C:\\App\\old.dll", "C:\\App\\my file.txt", "C:\\Program Files\\Maker\\stale.txt",
-                                   "C:\\App\\there.txt"};
-    for (const char* file : deleted) m.WriteFile(file, "x");
-    m.WriteFile("C:\\old.dll", "x");
-    EXPECT_TRUE(CommandString("C:\\App").Execute(
-        "[DEL] old.dll; [DEL] \"my file.txt\"; [DEL] \"C:\\Program Files\\Maker\\stale.txt\";"
-        "[DELIFEXISTS] there.txt; [DELIFEXISTS] missing.txt; [DELIFEXISTS] C:\\Nowhere\\missing.txt"));
-    for (const char* file : deleted) EXPECT_FALSE(plat::files::Exists(file)) << file;
-    EXPECT_TRUE(plat::files::Exists("C:\\old.dll"));
-
-    m.WriteFile("C:\\App\\locked.dll", "x");
+    for (const char* file : {"C:\\App\\old.dll", "C:\\App\\my file.txt", "C:\\App\\there.txt", "C:\\old.dll",
+                             "C:\\Program Files\\Maker\\stale.txt", "C:\\App\\locked.dll"}) {
+        m.WriteFile(file, "x");
+    }
     ASSERT_TRUE(plat::files::SetAttributes("C:\\App\\locked.dll", plat::files::kAttrReadOnly));
-    EXPECT_EQ(FileErrorOf("[DEL] missing.dll"), 2u);
-    EXPECT_EQ(FileErrorOf("[DEL] C:\\Nowhere\\missing.dll"), 3u);
-    EXPECT_EQ(FileErrorOf("[DEL] locked.dll"), 5u);
-    EXPECT_EQ(FileErrorOf("[DELIFEXISTS] locked.dll"), 5u);
-    EXPECT_TRUE(plat::files::Exists("C:\\App\\locked.dll"));
-}
-
-TEST(ExecuteRegistry, WritesNumbersAndTextsAsReadBack) {
-    pextest::TestMachine m;
-    EXPECT_TRUE(CommandString("C:\\App").Execute(
-        "[REGISTRY] (DWORD)HKLM\\Software\\Maker\\Product\\Flags=1;"
-        "[REGISTRY] (dword)hklm\\Software\\Maker\\Product\\Negative=-1;"
-        "[REGISTRY] (DWORD)HKLM\\Software\\Maker\\Product\\Word=abc;"
-        "[REGISTRY] (string)hkcu\\Software\\Maker\\Name=Value;"
-        "[REGISTRY] (STRING)HKCU/Software/Maker/Url=http://host/path;"
-        "[REGISTRY] (STRING)HKCU\\Software\\Maker\\=default"));
-    const std::string product = "Software\\Maker\\Product";
-    EXPECT_EQ(ReadValue(reg::kLocalMachine, product, "Flags", reg::kRegDword), Dword(1));
-    EXPECT_EQ(ReadValue(reg::kLocalMachine, product, "Negative", reg::kRegDword), Dword(0xFFFFFFFFu));
-    EXPECT_EQ(ReadValue(reg::kLocalMachine, product, "Word", reg::kRegDword), Dword(0));
-    EXPECT_EQ(ReadValue(reg::kCurrentUser, "Software\\Maker", "Name", reg::kRegSz), Sz("Value"));
-    EXPECT_EQ(ReadValue(reg::kCurrentUser, "Software\\Maker", "Url", reg::kRegSz), Sz("http:\\\\host\\path"));
-    EXPECT_EQ(ReadValue(reg::kCurrentUser, "Software\\Maker", "", reg::kRegSz), Sz("default"));
-}
-
-TEST(ExecuteRegistry, FailuresAfterParsing) {
-    pextest::TestMachine m;
-    // Parsing defects come out unchanged (their texts are the parser's own tests).
-    EXPECT_EQ(MessageOf("[REGISTRY] (DWORD)HKCR\\K\\N=1"), "Invalid Registration Parameter - Bad Root Key.");
-
-    // An unknown type is found only after the key exists, and the key stays.
-    EXPECT_EQ(MessageOf("[REGISTRY] (BINARY)HKCU\\Binary\\Name=1"), "Invalid Registration Parameter - Bad Data Type.");
-    EXPECT_TRUE(pextest::RegKeyExists(reg::kCurrentUser, "Binary"));
-
-    // A refused registry write: of the new key first, then of the value under the existing key.
-    plat::fault::FailNth(plat::fault::Op::RegWrite, 1, 5);
-    EXPECT_EQ(MessageOf("[REGISTRY] (DWORD)HKCU\\New\\Name=1"), "Unable to create requested registry key.");
-    plat::fault::FailNth(plat::fault::Op::RegWrite, 1, 5);
-    EXPECT_EQ(MessageOf("[REGISTRY] (STRING)HKCU\\Binary\\Name=1"), "Unable to create requested registry entry.");
-    plat::fault::Clear();
-}
-
-TEST(ExecuteRegSvr, OnlyDeclaredSelfRegisteringLibrariesAreRegistered) {
-    pextest::TestMachine m;
     // The test modules carry their own copy of the platform, which finds the machine as a child
     // process would: through PEX_MACHINE.
     pextest::SetEnvironment("PEX_MACHINE", m.Root());
-    const auto registered = [] {
-        return ReadValue(reg::kLocalMachine, "Software\\Vantric\\Test", "RegisteredBy", reg::kRegSz);
-    };
-    // Exports DllRegisterServer but lacks "OLESelfRegister": never loaded, so never called.
-    EXPECT_EQ(MessageOf("[REGSVR] " + AppFolder() + "PexNoSelfReg.dll"), "Registration Failed!");
-    EXPECT_EQ(MessageOf("[REGSVR] " + AppFolder() + "PexNoVersion.dll"), "Registration Failed!");
-    EXPECT_EQ(MessageOf("[REGSVR] C:\\App\\missing.dll"), "Registration Failed!");
-    EXPECT_EQ(registered(), "");
-
-    EXPECT_TRUE(CommandString("C:\\App").Execute("[REGSVR] \"" + AppFolder() + "PexSelfReg.dll\""));
-    EXPECT_EQ(registered(), Sz("PexSelfReg"));
+    for (const pextest::Case& c : pextest::ReadCases("commands/cases/executor_commands.txt")) {
+        SCOPED_TRACE(c.where);
+        std::string command = c[0];
+        if (command.find("<app>") != std::string::npos) command.replace(command.find("<app>"), 5, AppFolder());
+        EXPECT_EQ(Outcome(command), c[1]);
+        if (c.fields.size() > 2) {
+            EXPECT_EQ(ReadBack(c), c.fields.size() == 7 ? c[5] + " | " + pextest::Unescape(c[6]) : c.fields.back());
+        }
+    }
     pextest::RemoveEnvironment("PEX_MACHINE");
+}
+
+// Past the time-out the program is left running; it ends by itself soon after the test.
+TEST(Executors, AProgramThatDoesNotEndFails) {
+    pextest::TestMachine m;
+    CommandString::SetRunTimeoutMs(1);
+    EXPECT_EQ(Outcome("[RUN] pextestprog sleep 500", "C:\\"), "process failed");
+    CommandString::SetRunTimeoutMs(CommandString::kDefaultRunTimeoutMs);
+}
+
+// A refused registry write: of the new key first, then of the value under an existing key.
+TEST(Executors, RefusedRegistryWrites) {
+    pextest::TestMachine m;
+    pextest::SetRegText(reg::kCurrentUser, "Existing", "Other", "x");
+    plat::fault::FailNth(plat::fault::Op::RegWrite, 1, 5);
+    EXPECT_EQ(Outcome("[REGISTRY] (DWORD)HKCU\\New\\Name=1"), "Unable to create requested registry key.");
+    plat::fault::FailNth(plat::fault::Op::RegWrite, 1, 5);
+    EXPECT_EQ(Outcome("[REGISTRY] (STRING)HKCU\\Existing\\Name=1"), "Unable to create requested registry entry.");
+    plat::fault::Clear();
 }
 
 }  // namespace

@@ -2,19 +2,13 @@
 
 #include <gtest/gtest.h>
 
-namespace {
+#include "tests/support/case_file.h"
 
-using Items = std::vector<std::string>;
-
-// Blanks, tabs and line feeds are trimmed, carriage returns kept; empty items count only
-// before more text.
 TEST(ItemList, SplitsTrimsAndDropsTrailingEmptyItems) {
-    EXPECT_EQ(SplitItemList("[RUN] a.exe; [DEL] b.txt; \t\n"), (Items{"[RUN] a.exe", "[DEL] b.txt"}));
-    EXPECT_EQ(SplitItemList("a;;"), (Items{"a"}));
-    EXPECT_EQ(SplitItemList(" \t\n"), Items{});
-    EXPECT_EQ(SplitItemList(";a; ;b"), (Items{"", "a", "", "b"}));
-    EXPECT_EQ(SplitItemList(" \ta \n;\r b\r"), (Items{"a", "\r b\r"}));
-    EXPECT_EQ(SplitItemList("x, y,z;w", ','), (Items{"x", "y", "z;w"}));
+    for (const pextest::Case& c : pextest::ReadCases("commands/cases/item_lists.txt")) {
+        SCOPED_TRACE(c.where);
+        std::vector<std::string> items;
+        for (std::size_t i = 2; i < c.fields.size(); ++i) items.push_back(pextest::Unescape(c[i]));
+        EXPECT_EQ(SplitItemList(pextest::Unescape(c[1]), c[0][0]), items);
+    }
 }
-
-}  // namespace

@@ -1,6 +1,9 @@
+// The trace of parsing, validating and running a plan item by item is the golden run scripts'.
 #include "expr/execution_plan.h"
 
 #include <gtest/gtest.h>
+
+#include <new>
 
 #include "expr/expression_tree.h"
 #include "tests/expr/expr_test_support.h"
@@ -19,65 +22,53 @@ protected:
     pextest::TraceCapture trace;
 };
 
-TEST_F(ExecutionPlanTest, OneAssignmentFromParseToRow) {
-    TestRow row;
+// Services whose every read fails as the machine can: memory runs out.
+class ExhaustedServices : public UpdateServices {
+public:
+    using UpdateServices::UpdateServices;
+    COverrideExpression GetSymbol(std::string) override { throw std::bad_alloc(); }
+};
+
+// Runs "FORCED = AVAR; FORCED = TRUE" with services whose read of AVAR fails, and returns the
+// comments; the second item must still have run.
+Lines CommentsAfterAFailedRead(UpdateServices& services, TestRow& row) {
     ExecutionPlan plan;
-    ASSERT_TRUE(QuietParse(plan, "FORCED = TRUE"));
+    EXPECT_TRUE(QuietParse(plan, "FORCED = AVAR; FORCED = TRUE"));
     EXPECT_TRUE(plan.Validate());
-    EXPECT_EQ(plan.Execute(row.services), 0);
-    EXPECT_TRUE(plan.Comments().empty());
+    EXPECT_EQ(plan.Execute(services), COverrideExpression::kUnexpected);
     EXPECT_EQ(row.Cell("Force Download"), "1");
-    EXPECT_EQ(trace.Lines(),
-              (Lines{"Parsing: FORCED = TRUE", "Creating Variable [FORCED] of type Func",
-                     "Assigning Setting:FORCED()=true", "pushing # 1, SET()",
-                     "Validating ExecutionPlan: Here we go....!", "Validating Execution Item # 0.",
-                     "-- Done.", "The plan is: valid.", "That's all folks!",
-                     "ExecutingPlan: Here we go....!", "Executing Item # 0.",
-                     "Setting Symbol: FORCED(Force Download) to 1", "-- Done.",
-                     "That's all folks!"}));
+    return plan.Comments();
 }
 
+// Found by review: a failure other than the language's own escaped Execute and abandoned the
+// product run. Any failure fails its item; the plan's other items still run.
 TEST_F(ExecutionPlanTest, EveryItemRunsAndFailuresAreRecorded) {
     TestRow noAvar("Force Download,HomeDir", "0,C:\\App");
-    ExecutionPlan plan;
-    ASSERT_TRUE(QuietParse(plan, "FORCED = AND(AVAR, TRUE); FORCED = NOT FORCED"));
-    ASSERT_TRUE(plan.Validate());
-    EXPECT_EQ(plan.Execute(noAvar.services), COverrideExpression::kUnexpected);
-    EXPECT_EQ(plan.Comments(), Lines{"HResult: 0x8000ffff(Failed!):GetVar: Type Mismatch"});
-    EXPECT_EQ(noAvar.Cell("Force Download"), "1");
-    Lines lines = trace.Lines();
-    EXPECT_EQ(Lines(lines.end() - 10, lines.end()),
-              (Lines{"Executing Item # 0.", "         Looking up Variable [AVAR] of type Bool",
-                     "Plan Execution threw exception", "-- Done.", "Executing Item # 1.",
-                     "         Looking up Variable [FORCED] of type Bool",
-                     "Getting Symbol: FORCED --> FieldName:[Force Download]=[0]",
-                     "Setting Symbol: FORCED(Force Download) to 1", "-- Done.",
-                     "That's all folks!"}));
+    EXPECT_EQ(CommentsAfterAFailedRead(noAvar.services, noAvar),
+              Lines{"HResult: 0x8000ffff(Failed!):GetVar: Type Mismatch"});
+    TestRow row;
+    ExhaustedServices exhausted(row.ref);
+    EXPECT_EQ(CommentsAfterAFailedRead(exhausted, row), Lines{"HResult: 0x8000ffff(Failed!):std::bad_alloc"});
+    EXPECT_TRUE(trace.Contains("ExecutionPlan: Execute, item # 0 failed: std::bad_alloc"));
 }
 
-TEST_F(ExecutionPlanTest, ValidationStopsCheckingAfterTheFirstInvalidItem) {
+TEST_F(ExecutionPlanTest, ValidationStopsCommentingAfterTheFirstInvalidItem) {
     ExecutionPlan plan;
     ASSERT_TRUE(QuietParse(plan, "FORCED = \"x\"; FORCED = 1"));
     trace.Clear();
     EXPECT_FALSE(plan.Validate());
     EXPECT_EQ(plan.Comments(), Lines{"Type mismatch between FORCED and "});
-    EXPECT_EQ(trace.Lines(),
-              (Lines{"Validating ExecutionPlan: Here we go....!", "Validating Execution Item # 0.",
-                     "-- Done.", "Validating Execution Item # 1.", "-- Done.",
-                     "The plan is: INVALID.  Validation Comments:", "That's all folks!"}));
+    EXPECT_TRUE(trace.Contains("Validating Execution Item # 1."));
     EXPECT_FALSE(plan.Validate());
     EXPECT_EQ(plan.Comments().size(), 1u);  // comments start afresh
 }
 
 TEST_F(ExecutionPlanTest, TheCurrentPlanReceivesThePushes) {
-    {
-        ExecutionPlan plan;
-        EXPECT_FALSE(QuietParse(plan, ""));
-        EXPECT_TRUE(QuietParse(plan, "FORCED = TRUE"));
-        EXPECT_TRUE(QuietParse(plan, "FORCED = FALSE"));  // a second parse appends
-        EXPECT_EQ(plan.Items().size(), 2u);
-        EXPECT_EQ(&CurrentPlan(), &plan);
-    }
+    ExecutionPlan plan;
+    EXPECT_TRUE(QuietParse(plan, "FORCED = TRUE"));
+    EXPECT_TRUE(QuietParse(plan, "FORCED = FALSE"));  // a second parse appends
+    EXPECT_EQ(plan.Items().size(), 2u);
+    EXPECT_EQ(&CurrentPlan(), &plan);
 }
 
 }  // namespace

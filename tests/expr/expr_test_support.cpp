@@ -2,10 +2,6 @@
 
 #include <gtest/gtest.h>
 
-#include "expr/evaluation.h"
-#include "expr/expression_text.h"
-#include "expr/validation.h"
-
 namespace exprtest {
 
 TestRow::TestRow(const std::string& header, const std::string& line) {
@@ -25,14 +21,6 @@ bool QuietParse(ExecutionPlan& plan, const std::string& text, std::string* outpu
     return ok;
 }
 
-Parsed ParseText(const std::string& text) {
-    ExecutionPlan plan;
-    Parsed parsed;
-    parsed.ok = QuietParse(plan, text, &parsed.output);
-    for (const COverrideExpression& item : plan.Items()) parsed.items.push_back(ExpressionText(item));
-    return parsed;
-}
-
 COverrideExpression ParseExpression(const std::string& text) {
     ExecutionPlan plan;
     std::string output;
@@ -40,24 +28,6 @@ COverrideExpression ParseExpression(const std::string& text) {
     EXPECT_TRUE(ok) << text << ": " << output;
     if (!ok || plan.Items().empty()) return COverrideExpression();
     return plan.Items()[0].params.at(1);
-}
-
-std::vector<std::string> ValidationOf(const std::string& text) {
-    ExecutionPlan plan;
-    std::string output;
-    EXPECT_TRUE(QuietParse(plan, text, &output)) << text << ": " << output;
-    if (plan.Validate()) return {"valid"};
-    return plan.Comments();
-}
-
-std::string FailureOf(const COverrideExpression& node, UpdateServices& services) {
-    try {
-        Evaluate(node, services);
-    } catch (const COverrideExpression& failure) {
-        EXPECT_EQ(failure.code, COverrideExpression::kUnexpected);
-        return failure.name;
-    }
-    return "no failure";
 }
 
 }  // namespace exprtest

@@ -11,21 +11,23 @@
 
 namespace exprtest {
 
-// Services over one row that record the name of every GetSymbol before doing the real work.
+// Services over one row that record the name of every GetSymbol ("AVAR HomeDir") before doing
+// the real work.
 class RecordingServices : public UpdateServices {
 public:
     explicit RecordingServices(RowReference& row) : UpdateServices(row) {}
     COverrideExpression GetSymbol(std::string name) override {
-        reads.push_back(name);
+        reads += (reads.empty() ? "" : " ") + name;
         return UpdateServices::GetSymbol(name);
     }
-    std::vector<std::string> reads;
+    std::string reads;
 };
 
-// A content table of one row built from a header and a data line, with recording services.
+// A content table of one row built from a header and a data line, with recording services. The
+// default header names two columns in another case than the scripts do: names match any case.
 class TestRow {
 public:
-    explicit TestRow(const std::string& header = "Force Download,HomeDir,FileName,AVAR",
+    explicit TestRow(const std::string& header = "FORCE DOWNLOAD,homedir,FileName,AVAR",
                      const std::string& line = "0,C:\\App,a.dll,1");
     std::string Cell(const std::string& column) const;
     CContentTable table;
@@ -36,21 +38,7 @@ public:
 // plan.Parse(text) with stdout (where the parser reports) captured into *output when given.
 bool QuietParse(ExecutionPlan& plan, const std::string& text, std::string* output = nullptr);
 
-// Parses text into a fresh plan.
-struct Parsed {
-    bool ok = false;
-    std::vector<std::string> items;  // ExpressionText of each item
-    std::string output;
-};
-Parsed ParseText(const std::string& text);
-
 // The expression of "FORCED = <text>", unvalidated, for evaluating it directly.
 COverrideExpression ParseExpression(const std::string& text);
-
-// Runs the plan's validation and returns its comments, or {"valid"} when it passed.
-std::vector<std::string> ValidationOf(const std::string& text);
-
-// The message of the failure object that evaluating node throws; "no failure" otherwise.
-std::string FailureOf(const COverrideExpression& node, UpdateServices& services);
 
 }  // namespace exprtest
