@@ -6,6 +6,7 @@
 #include <stdexcept>
 
 #include "platform/registry.h"
+#include "tests/support/case_file.h"
 #include "tests/support/test_machine.h"
 #include "tests/support/test_registry.h"
 
@@ -69,13 +70,10 @@ TEST(AppTest, ProfileStringsComeFromTheRegistryProfile) {
     set("PBranch", plat::reg::kRegSz, "beta");
     set("Expanded", plat::reg::kRegExpandSz, std::string("%TEMP%\0", 7));
     set("PromptThreshold", plat::reg::kRegDword, std::string("\x05\0\0\0", 4));
-    EXPECT_EQ(theApp.GetProfileString("Settings", "UBranch", "x"), "release");
-    EXPECT_EQ(theApp.GetProfileString("settings", "pbranch", "x"), "beta");
-    EXPECT_EQ(theApp.GetProfileString("Settings", "Expanded"), "%TEMP%");
-    EXPECT_EQ(theApp.GetProfileString("Settings", "Missing", "fallback"), "fallback");
-    EXPECT_EQ(theApp.GetProfileString("Nowhere", "UBranch", "fallback"), "fallback");
-    EXPECT_EQ(theApp.GetProfileString("Settings", "PromptThreshold", "10"), "10");
-    EXPECT_EQ(theApp.GetProfileString("Settings", "Missing"), "");
+    for (const pextest::Case& c : pextest::ReadCases("platform/cases/profile_strings.txt")) {
+        SCOPED_TRACE(c.where);
+        EXPECT_EQ(theApp.GetProfileString(c[0], c[1], c[2]), c[3]);
+    }
 }
 
 }  // namespace

@@ -13,6 +13,7 @@
 #include "platform/fault.h"
 #include "platform/files.h"
 #include "platform/paths.h"
+#include "tests/support/case_file.h"
 #include "tests/support/environment.h"
 #include "tests/support/platform_guard.h"
 #include "tests/support/test_machine.h"
@@ -43,15 +44,11 @@ void InstallTestProgram(const pextest::TestMachine& m, const std::string& winPat
 }
 
 TEST(SplitCommandLine, FollowsTheWindowsRules) {
-    using V = std::vector<std::string>;
-    EXPECT_EQ(plat::proc::SplitCommandLine(R"(prog a  b	c)"), (V{"prog", "a", "b", "c"}));
-    EXPECT_EQ(plat::proc::SplitCommandLine(R"("C:\Program Files\x.exe" "a b" c")"),
-              (V{R"(C:\Program Files\x.exe)", "a b", "c"}));
-    // Backslashes count only before a quote: 2n give n, 2n+1 give n and a literal quote.
-    EXPECT_EQ(plat::proc::SplitCommandLine(R"(p a\\b a\\\"b "a\\" x\"y "" "a""b")"),
-              (V{"p", R"(a\\b)", R"(a\"b)", R"(a\)", R"(x"y)", "", R"(a"b)"}));
-    // The program name keeps its backslashes, even before a closing quote.
-    EXPECT_EQ(plat::proc::SplitCommandLine(R"(C:\dir\ x)"), (V{R"(C:\dir\)", "x"}));
+    for (const pextest::Case& c : pextest::ReadCases("platform/cases/command_lines.txt")) {
+        SCOPED_TRACE(c.where);
+        const std::vector<std::string> expected(c.fields.begin() + 1, c.fields.end());
+        EXPECT_EQ(plat::proc::SplitCommandLine(c[0]), expected);
+    }
     EXPECT_TRUE(plat::proc::SplitCommandLine("   ").empty());
 }
 
@@ -97,16 +94,13 @@ TEST(Process, CommandLineReachesTheProgramIntact) {
 TEST(Process, ProgramThatCannotStart) {
     pextest::TestMachine m;
     Process p;
-    EXPECT_FALSE(plat::proc::Start("nosuchprogram 1", "", &p));
-    EXPECT_EQ(plat::LastError(), 2u);
-    EXPECT_FALSE(plat::proc::Start("C:\\nosuchprogram.exe", "", &p));
-    EXPECT_EQ(plat::LastError(), 2u);
-    EXPECT_FALSE(plat::proc::Start("C:\\nofolder\\prog.exe", "", &p));
-    EXPECT_EQ(plat::LastError(), 3u);
+    for (const pextest::Case& c : pextest::ReadCases("platform/cases/failed_starts.txt")) {
+        SCOPED_TRACE(c.where);
+        EXPECT_FALSE(plat::proc::Start(c[0], c[1], &p));
+        EXPECT_EQ(plat::LastError(), std::stoul(c[2]));
+    }
     EXPECT_FALSE(plat::proc::Start("", "", &p));
     EXPECT_EQ(plat::LastError(), 2u);
-    EXPECT_FALSE(plat::proc::Start("pextestprog exit 0", "C:\\nofolder", &p));
-    EXPECT_EQ(plat::LastError(), 267u);
     EXPECT_FALSE(p);
 
     plat::fault::FailNth(plat::fault::Op::ProcessStart, 1, 5);

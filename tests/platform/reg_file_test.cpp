@@ -13,6 +13,7 @@
 #include "platform/reg_text.h"
 #include "platform/reg_tree.h"
 #include "platform/registry.h"
+#include "tests/support/case_file.h"
 #include "tests/support/test_machine.h"
 #include "tests/support/test_registry.h"
 
@@ -55,24 +56,12 @@ const char kProducts[] = "HKLM\\Software\\Vantric\\Pex";
 TEST_F(RegFileTest, ExportThenImportReproducesEveryTypeAndOddBytes) {
     std::string everyByte;
     for (int i = 0; i < 256; ++i) everyByte += static_cast<char>(i);
-    const std::string key = std::string(kProducts) + "\\Zendor32";
-    Set(key, "", reg::kRegSz, std::string("default\0", 8));
-    Set(key, "Quote\"And\\Slash", reg::kRegSz, std::string("C:\\Program Files\\\"x\"\0", 21));
-    Set(key, "NoNul", reg::kRegSz, "abc");
-    Set(key, "Empty", reg::kRegSz, "");
-    Set(key, "NulOnly", reg::kRegSz, std::string(1, '\0'));
-    Set(key, "Lines", reg::kRegSz, std::string("a\r\nb\0", 5));
-    Set(key, "Expand", reg::kRegExpandSz, std::string("%TEMP%\\\xE9\xFF\0", 10));
-    Set(key, "Multi", reg::kRegMultiSz, std::string("one\0two\0\0", 9));
-    Set(key, "Dword", reg::kRegDword, std::string("\x1f\x00\x00\x80", 4));
-    Set(key, "ShortDword", reg::kRegDword, "\x01");
-    Set(key, "Binary", reg::kRegBinary, everyByte);
-    Set(key, "EmptyBinary", reg::kRegBinary, "");
-    Set(key, "None", reg::kRegNone, std::string("\0\x01", 2));
-    Set(key, "Qword", 11, std::string("\x01\x02\x03\x04\x05\x06\x07\x08", 8));
-    Set(key + "\\Nested\\Deeper", "\xC4name", reg::kRegSz, std::string("\xE4\0", 2));
-    Set(std::string(kProducts) + "\\Orlandel", "DefaultPath", reg::kRegSz,
-        std::string("C:\\\0", 4));
+    Set(std::string(kProducts) + "\\Zendor32", "Binary", reg::kRegBinary, everyByte);
+    const auto values = pextest::ReadCases("platform/cases/reg_values.txt");
+    const auto key = [](const pextest::Case& c) { return std::string(kProducts) + "\\" + c[0]; };
+    const auto name = [](const pextest::Case& c) { return c[1] == "@" ? "" : pextest::Unescape(c[1]); };
+    for (const pextest::Case& c : values)
+        Set(key(c), name(c), static_cast<std::uint32_t>(std::stoul(c[2])), pextest::Unescape(c[3]));
 
     std::string file;
     ASSERT_EQ(0, reg::ExportRegFile(Path(kProducts), &file));
@@ -83,11 +72,11 @@ TEST_F(RegFileTest, ExportThenImportReproducesEveryTypeAndOddBytes) {
     reg::RegFileError error;
     ASSERT_EQ(0, reg::ImportRegFile(file, &error)) << error.line << ": " << error.message;
     EXPECT_EQ(before, Export(kProducts));
-    EXPECT_EQ("3:" + everyByte, Get(key, "binary"));
-    EXPECT_EQ("1:abc", Get(key, "NoNul"));
-    EXPECT_EQ("1:", Get(key, "Empty"));
-    EXPECT_EQ(std::string("2:%TEMP%\\\xE9\xFF\0", 12), Get(key, "Expand"));
-    EXPECT_EQ(std::string("1:\xE4\0", 4), Get(key + "\\Nested\\Deeper", "\xC4NAME"));
+    EXPECT_EQ("3:" + everyByte, Get(std::string(kProducts) + "\\Zendor32", "Binary"));
+    for (const pextest::Case& c : values) {
+        SCOPED_TRACE(c.where);
+        EXPECT_EQ(Get(key(c), name(c)), c[2] + ":" + pextest::Unescape(c[3]));
+    }
 }
 
 // Values are made in name order: Windows lists them in the order of creation, Wine by name.
@@ -114,32 +103,14 @@ TEST_F(RegFileTest, ExportIsUtf16WithTheLayoutOfTheRegistryEditor) {
 }
 
 TEST_F(RegFileTest, AMalformedLineIsNamedAndNothingOfTheFileIsImported) {
-    const std::string file =
-        "Windows Registry Editor Version 5.00\r\n"
-        "\r\n"
-        "[HKEY_LOCAL_MACHINE\\Software\\Vantric\\Pex\\Zendor32]\r\n"
-        "\"DefaultPath\"=\"C:\\\\Program Files\"\r\n"
-        "\"Mode\"=dword:1\r\n"
-        "\"Bad\"=hex:01,02,\\\r\n"
-        "  0g\r\n";
-    reg::RegFileError error;
-    EXPECT_EQ(87, reg::ImportRegFile(file, &error));
-    EXPECT_EQ(6, error.line);
-    EXPECT_NE(std::string::npos, error.message.find("hex")) << error.message;
-    EXPECT_FALSE(KeyExists(kProducts));
-
-    for (const auto& [text, line] : std::vector<std::pair<std::string, int>>{
-             {"REGEDIT5\r\n", 1},
-             {"REGEDIT4\n\n\"v\"=\"x\"\n", 3},
-             {"REGEDIT4\n[HKEY_USERS\\x]\n", 2},
-             {"REGEDIT4\n[HKLM\\x]\n\"v\"=dword:123456789\n", 3},
-             {"REGEDIT4\n[HKLM\\x]\n\"v\"=\"open\n", 3},
-             {"REGEDIT4\n[HKLM\\x]\n\"v\"\n", 3},
-             {"REGEDIT4\n[HKLM\\x\n", 2},
-             {"REGEDIT4\n[-HKLM\\x]\n\"v\"=\"x\"\n", 3}}) {
-        EXPECT_EQ(87, reg::ImportRegFile(text, &error)) << text;
-        EXPECT_EQ(line, error.line) << text;
+    for (const pextest::Case& c : pextest::ReadCases("platform/cases/reg_imports.txt")) {
+        SCOPED_TRACE(c.where);
+        reg::RegFileError error;
+        EXPECT_EQ(std::stol(c[1]), reg::ImportRegFile(pextest::Unescape(c[0]), &error));
+        EXPECT_EQ(std::stoi(c[2]), error.line);
+        EXPECT_NE(std::string::npos, error.message.find(c[3])) << error.message;
     }
+    EXPECT_FALSE(KeyExists(kProducts));
 }
 
 TEST_F(RegFileTest, AChangeThatFailsUndoesTheWholeImport) {
@@ -218,17 +189,12 @@ TEST_F(RegFileTest, RecursiveQueryOfOneValuePrintsLikeTheWindowsCommand) {
 }
 
 TEST_F(RegFileTest, AddDataIsConvertedByType) {
-    auto data = [](std::uint32_t type, const std::string& text, const std::string& separator = "\\0") {
+    for (const pextest::Case& c : pextest::ReadCases("platform/cases/reg_data.txt")) {
+        SCOPED_TRACE(c.where);
         std::string bytes, why;
-        return reg::DataFromText(type, text, separator, &bytes, &why) ? bytes : "<refused>";
-    };
-    EXPECT_EQ("\xff\xff\xff\xff", data(reg::kRegDword, "4294967295"));
-    EXPECT_EQ(std::string("\x1f\0\0\0", 4), data(reg::kRegDword, "0x1F"));
-    EXPECT_EQ("<refused>", data(reg::kRegDword, "4294967296"));
-    EXPECT_EQ(std::string("a\0b\0\0", 5), data(reg::kRegMultiSz, "a#b", "#"));
-    EXPECT_EQ(std::string("\0\xff", 2), data(reg::kRegBinary, "00fF"));
-    EXPECT_EQ("<refused>", data(reg::kRegBinary, "abc"));
-    EXPECT_EQ(std::string("%PATH%\0", 7), data(reg::kRegExpandSz, "%PATH%"));
+        const bool converted = reg::DataFromText(static_cast<std::uint32_t>(std::stoul(c[0])), c[1], c[2], &bytes, &why);
+        EXPECT_EQ(converted ? bytes : "refused", pextest::Unescape(c[3]));
+    }
     std::uint32_t type = 0;
     EXPECT_TRUE(reg::TypeFromName("reg_expand_sz", &type));
     EXPECT_EQ(reg::kRegExpandSz, type);

@@ -10,6 +10,7 @@
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "platform/pe_resources.h"
+#include "tests/support/case_file.h"
 #include "tests/support/environment.h"
 #include "tests/support/test_machine.h"
 
@@ -40,16 +41,10 @@ TEST(VersionInfo, WindowsDllFixture) {
     ASSERT_EQ(info.Translations().size(), 2u);
     EXPECT_EQ(info.Translations()[1].language, 0x0407);
     EXPECT_EQ(info.Translations()[1].codePage, 0x04E4);
-    const std::pair<const char*, const char*> strings[] = {
-        {"\\StringFileInfo\\040904b0\\fileversion", "3.10.40000.5"},
-        {"\\StringFileInfo\\040704E4\\FileDescription", "Versionsbeispiel"},
-        // Latin-1 characters stay, the others become '?'.
-        {"\\StringFileInfo\\040904B0\\LegalCopyright", "\xA9 2024 Example, ?"},
-        {"\\StringFileInfo\\040904B0\\OLESelfRegister", ""},
-        {"\\StringFileInfo\\040704E4\\CompanyName", "<none>"},
-        {"\\StringFileInfo\\040904E4\\CompanyName", "<none>"},
-    };
-    for (const auto& [subBlock, value] : strings) EXPECT_EQ(StringOf(info, subBlock), value) << subBlock;
+    for (const pextest::Case& c : pextest::ReadCases("platform/cases/fixture_versions.txt")) {
+        SCOPED_TRACE(c.where);
+        EXPECT_EQ(StringOf(info, c[0]), pextest::Unescape(c[1]));
+    }
 }
 
 // Our stamped programs and modules; a bare name is found by the library search, as
