@@ -14,6 +14,7 @@
 
 #include "platform/errors.h"
 #include "platform/paths.h"
+#include "platform/regular_file.h"
 #include "tests/support/case_file.h"
 #include "tests/support/platform_guard.h"
 #include "tests/support/test_machine.h"
@@ -95,6 +96,18 @@ TEST_F(Files, AFileLockedByAnotherOpenerIsInUse) {
     close(fd);
     EXPECT_TRUE(files::Copy("C:\\app\\src.txt", "C:\\app\\dst.txt", false));
 #endif
+}
+
+// The version reader reads pieces of a module up to its very last byte, and never beyond it.
+TEST_F(Files, ARegularFileReadsAnyRangeUpToItsEnd) {
+    files::RegularFile f;
+    ASSERT_TRUE(f.Open("C:\\app\\src.txt"));  // "new content"
+    std::string bytes;
+    EXPECT_TRUE(f.ReadAt(4, 7, &bytes));
+    EXPECT_EQ(bytes, "content");
+    EXPECT_TRUE(f.ReadAt(11, 0, &bytes));
+    EXPECT_FALSE(f.ReadAt(5, 7, &bytes));
+    EXPECT_FALSE(f.ReadAt(12, 0, &bytes));
 }
 
 TEST_F(Files, TempFileNamesAreNewEmptyFiles) {

@@ -66,7 +66,7 @@ TEST(Process, ProgramsAreFoundWhereWindowsLooksAndGiveTheirExitCode) {
     EXPECT_EQ(m.ReadFile("C:\\cur\\marker.txt"), "marked\n");
 
     std::string saved = std::getenv("PATH") ? std::getenv("PATH") : "";
-    pextest::SetEnvironment("PATH", "C:\\nowhere;C:\\tools");
+    pextest::SetEnvironment("PATH", "C:\\tools;C:\\nowhere");
     long onPath = RunToEnd("onpath.exe exit 5");
     pextest::SetEnvironment("PATH", saved);
     EXPECT_EQ(onPath, 5);

@@ -149,7 +149,7 @@ TEST_F(RegFileTest, VersionFourTextsAreSingleByteAndDeletionsApply) {
         "REGEDIT4\n"
         "; a comment\n"
         "[HKEY_CLASSES_ROOT\\.pex]\n"
-        "@=\"Pex.File\"\n"
+        "@=\"C:\\Pex.File\"\n"  // a backslash that escapes nothing stays
         "\"Old\"=-\n"
         "\"Paths\"=hex(7):61,00,\\\n"
         "    62,00,00\n"
@@ -157,14 +157,14 @@ TEST_F(RegFileTest, VersionFourTextsAreSingleByteAndDeletionsApply) {
         "[-HKLM\\Software\\NeverThere]\n";
     reg::RegFileError error;
     ASSERT_EQ(0, reg::ImportRegFile(file, &error)) << error.line << ": " << error.message;
-    EXPECT_EQ(std::string("1:Pex.File\0", 11), Get("HKLM\\Software\\Classes\\.pex", ""));
+    EXPECT_EQ(std::string("1:C:\\Pex.File\0", 14), Get("HKLM\\Software\\Classes\\.pex", ""));
     EXPECT_EQ("missing", Get("HKCR\\.pex", "Old"));
     EXPECT_EQ(std::string("7:a\0b\0\0", 7), Get("HKCR\\.pex", "Paths"));
     EXPECT_FALSE(KeyExists("HKLM\\Software\\Gone"));
 }
 
 // reg query /s /v NAME: the value in the key and in each subkey that has it, then the count.
-// The plain listing of every type is checked through `pexupdate reg` (reg_command_test.cpp).
+// The plain listing of every type is checked through `pexupdate reg` (the golden run pexupdate_reg).
 TEST_F(RegFileTest, RecursiveQueryOfOneValuePrintsLikeTheWindowsCommand) {
     const std::string key = std::string(kProducts) + "\\Zendor32";
     Set(key, "DefaultPath", reg::kRegSz, std::string("C:\\Program Files\\Vantric\0", 25));
