@@ -27,12 +27,3 @@ if(TARGET Rivzip)
     LIBS rivzip_codec)
   add_dependencies(rivzip_module_test Rivzip)
 endif()
-
-# `pexupdate compress` and `expand`, run as a program that loads Rivzip.dll beside it.
-if(TARGET pexupdate AND TARGET Rivzip)
-  pex_add_test(compress_command_test
-    SOURCES rivzip/memory_streams.cpp rivzip/compress_command_test.cpp
-    LIBS rivzip_codec)
-  target_compile_definitions(compress_command_test PRIVATE PEXUPDATE_PATH="$<TARGET_FILE:pexupdate>")
-  add_dependencies(compress_command_test pexupdate Rivzip)
-endif()

@@ -1,70 +1,44 @@
 #include "tests/crash/crash_product.h"
 
-#include <zlib.h>
-
 #include <algorithm>
+#include <filesystem>
 
 #include "decompress/expansion_record.h"
 #include "model/run_journal.h"
 #include "platform/files.h"
-#include "tests/rivzip/memory_streams.h"
-#include "tests/support/case_file.h"
+#include "platform/reg_file.h"
 #include "tests/support/test_registry.h"
 
+namespace fs = std::filesystem;
 namespace reg = plat::reg;
 
 namespace pextest {
 
-namespace {
-
-// About 150 KB of text.
-std::string Payload(const std::string& name) {
-    std::string bytes;
-    for (int line = 0; bytes.size() < 150000; ++line)
-        bytes += name + " version 2, line " + std::to_string(line * 7919 % 100003) + "\r\n";
-    return bytes;
-}
-
-std::string Deflate(const std::string& bytes) {
-    uLongf size = compressBound(static_cast<uLong>(bytes.size()));
-    std::string out(size, '\0');
-    compress2(reinterpret_cast<Bytef*>(out.data()), &size,
-              reinterpret_cast<const Bytef*>(bytes.data()), static_cast<uLong>(bytes.size()), 9);
-    out.resize(size);
-    return out;
-}
-
-}  // namespace
-
+// The product's machine is kept as data in crash/product: the registry (machine.reg), the files
+// before the run (before/<drive letter>/...) and the bytes each update file must leave (after/).
 void CrashProduct::SetUp() {
-    SetRegText(reg::kLocalMachine, "Software\\Vantric\\Fetch", "Capabilities", "ZLIB;LZW");
-    SetRegText(reg::kLocalMachine, "Software\\Vantric\\Disk", "Capabilities", "LZW;None");
-    std::vector<ContentRow> rows;
-    for (const Case& c : ReadCases("crash/cases/product.txt")) {
-        auto cell = [&](std::size_t i) { return c[i] == "-" ? std::string() : c[i]; };
-        ProductFile file{c[0], c[1] != "-", cell(1), c[2], "", "", c[3] != "plain"};
-        if (c[2] == "(payload)") file.newBytes = Payload(c[0].substr(0, c[0].find('.')));
-        if (c[3] == "szdd") file.published = rivziptest::CompressText(file.newBytes);
-        else file.published = c[3] == "zlib" ? Deflate(file.newBytes) : file.newBytes;
-        if (file.hadTarget) machine.WriteFile(file.Target(), file.oldBytes);
-        ContentRow row = Row(file.name, file.published, cell(4), cell(5));
-        file.download = row["DownLoadCacheFile"];
-        row["NeedsDecompression"] = file.expanded ? "1" : "0";
-        if (file.expanded) row["InterestedParties"] = cell(6);
-        row["Command"] = cell(7);
-        row["UpdateDate"] = cell(8);
+    const fs::path folder = PEX_CRASH_PRODUCT;
+    reg::RegFileError error;
+    ASSERT_EQ(reg::ImportRegFile(ReadHostFile((folder / "machine.reg").string()), &error), 0) << error.message;
+    for (const auto& entry : fs::recursive_directory_iterator(folder / "before")) {
+        if (!entry.is_regular_file()) continue;
+        std::string path = fs::relative(entry.path(), folder / "before").string();  // C/App/core.dll
+        std::replace(path.begin(), path.end(), '/', '\\');
+        machine.WriteFile(path.insert(1, ":"), ReadHostFile(entry.path().string()));
+    }
+    const CContentTable table = Content();
+    for (std::uint32_t row = 0; row + 1 < table.RowCount(); ++row) {  // the last row is keep.dll's
+        ProductFile file;
+        file.name = table.Field(row, "FileName");
+        file.download = table.Field(row, "DownLoadCacheFile");
+        file.expanded = table.Field(row, "NeedsDecompression") == "1";
+        file.oldBytes = Contents(file.Target());
+        file.hadTarget = file.oldBytes != "(missing)";
+        file.published = Contents(file.download);
+        file.newBytes = ReadHostFile((folder / "after" / file.name).string());
         files_.push_back(file);
-        rows.push_back(row);
     }
     ASSERT_TRUE(plat::files::SetAttributes(files_[1].Target(), plat::files::kAttrReadOnly));
-    machine.WriteFile(kInstalled, "keep 1.0");
-    machine.WriteFile(kForeignBackup, "app 0.9, another tool's");
-    ContentRow skipped = Row("keep.dll", "unused");
-    skipped["UpgradeStatus"] = "Skipped";
-    skipped["DownLoadCacheFile"] = kInstalled;
-    ASSERT_TRUE(plat::files::Remove("C:\\Pex\\cache\\keep.dll.new"));  // the row names the installed file instead
-    rows.push_back(skipped);
-    Publish(rows);
 }
 
 std::string CrashProduct::Contents(const std::string& winPath) {

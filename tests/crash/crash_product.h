@@ -1,7 +1,8 @@
-// The product of the crash and error-injection tests (its update files are in
-// cases/product.txt), and the states it may be found in. Beside them, files that only look like leftovers of an earlier run, which no run may touch: a
-// row read as applied ("Skipped") whose download is an installed file, keep.dll, and a backup
-// of app.exe that some other tool left.
+// The product of the crash and error-injection tests (its machine is the folder product, whose
+// README says what each file shows), and the states it may be found in. Beside its update
+// files, files that only look like leftovers of an earlier run, which no run may touch: a row
+// read as applied ("Skipped") whose download is an installed file, keep.dll, and a backup of
+// app.exe that some other tool left.
 #pragma once
 #include <string>
 #include <vector>

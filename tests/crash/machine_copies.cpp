@@ -4,8 +4,10 @@
 #include <unistd.h>
 
 #include <filesystem>
+#include <map>
 #include <stdexcept>
 
+#include "platform/digest.h"
 #include "platform/machine.h"
 #include "platform/reg_file.h"
 #include "tests/support/test_machine.h"
@@ -26,8 +28,12 @@ std::string FileEntry(const fs::path& file) {
     struct stat st {};
     if (stat(file.c_str(), &st) != 0) return "(gone)";
     const bool readOnly = (st.st_mode & S_IWUSR) == 0;
+    const std::string bytes = ReadHostFile(file.string());
+    plat::digest::Sha256 sha;
+    std::string digest;
+    if (!sha.Update(bytes.data(), bytes.size()) || !sha.Finish(&digest)) return "(no digest)";
     return std::string(readOnly ? "ro " : "rw ") + std::to_string(st.st_mtim.tv_sec) + "." +
-           std::to_string(st.st_mtim.tv_nsec) + " " + ReadHostFile(file.string());
+           std::to_string(st.st_mtim.tv_nsec) + " " + digest;
 }
 
 std::string HiveText(const char* hive) {
@@ -54,29 +60,15 @@ MachineCopy::~MachineCopy() {
     fs::remove_all(root_, ec);
 }
 
-MachineSnapshot SnapshotMachine() {
-    MachineSnapshot snapshot;
+std::string SnapshotMachine() {
+    std::map<std::string, std::string> files;  // in name order, whatever order the folder lists
     const std::string root = plat::machine::Root();
     for (const auto& entry : fs::recursive_directory_iterator(root + "/drive_c")) {
-        if (!entry.is_regular_file()) continue;
-        snapshot["file:" + entry.path().string().substr(root.size())] = FileEntry(entry.path());
+        if (entry.is_regular_file()) files[entry.path().string().substr(root.size())] = FileEntry(entry.path());
     }
-    snapshot["reg:HKLM"] = HiveText("HKEY_LOCAL_MACHINE");
-    snapshot["reg:HKCU"] = HiveText("HKEY_CURRENT_USER");
-    return snapshot;
-}
-
-std::string SnapshotDifference(const MachineSnapshot& before, const MachineSnapshot& after) {
-    std::string out;
-    for (const auto& [key, value] : before) {
-        auto it = after.find(key);
-        if (it == after.end()) out += "  gone: " + key + "\n";
-        else if (it->second != value) out += "  changed: " + key + "\n";
-    }
-    for (const auto& [key, value] : after) {
-        if (!before.count(key)) out += "  new: " + key + "\n";
-    }
-    return out;
+    std::string text;
+    for (const auto& [path, entry] : files) text += path + " " + entry + "\n";
+    return text + HiveText("HKEY_LOCAL_MACHINE") + HiveText("HKEY_CURRENT_USER");
 }
 
 }  // namespace pextest

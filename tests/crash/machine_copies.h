@@ -1,7 +1,6 @@
 // Copies of a prepared emulated machine, so that every crash scenario starts from the same
 // state, and snapshots of a machine's files and registry, to compare two moments.
 #pragma once
-#include <map>
 #include <string>
 
 namespace pextest {
@@ -23,12 +22,9 @@ private:
     std::string root_;
 };
 
-// What a machine holds: every file below drive_c (bytes, read-only state, write time) and the
-// two hives as registry text. Keys are "file:<host path below the root>" and "reg:<hive>".
-using MachineSnapshot = std::map<std::string, std::string>;
-MachineSnapshot SnapshotMachine();
-
-// The keys whose entries differ, for a readable failure message.
-std::string SnapshotDifference(const MachineSnapshot& before, const MachineSnapshot& after);
+// What a machine holds, as text: a line per file below drive_c (its host path below the root,
+// read-only state, write time and the SHA-256 of its bytes) in name order, then the two hives
+// as registry text. Two snapshots compare as text, so that a difference shows as a diff.
+std::string SnapshotMachine();
 
 }  // namespace pextest
