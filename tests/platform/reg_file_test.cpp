@@ -1,5 +1,6 @@
-// .reg files and the output of `reg query`: export and import reproduce a key exactly, a
-// malformed or failing file changes nothing, every encoding a file may come in is read.
+// .reg files: export and import reproduce a key exactly, a malformed or failing file changes
+// nothing, every encoding a file may come in is read. The layout of an export and the output of
+// `reg query` are the golden runs pexupdate_reg and pexupdate_reg_export.
 #include "platform/reg_file.h"
 
 #include <gtest/gtest.h>
@@ -9,7 +10,6 @@
 #include "platform/errors.h"
 #include "platform/fault.h"
 #include "platform/reg_data.h"
-#include "platform/reg_query.h"
 #include "platform/reg_text.h"
 #include "platform/reg_tree.h"
 #include "platform/registry.h"
@@ -79,29 +79,6 @@ TEST_F(RegFileTest, ExportThenImportReproducesEveryTypeAndOddBytes) {
     }
 }
 
-// Values are made in name order: Windows lists them in the order of creation, Wine by name.
-TEST_F(RegFileTest, ExportIsUtf16WithTheLayoutOfTheRegistryEditor) {
-    Set(kProducts, "Blob", reg::kRegBinary, std::string(30, '\xAB'));
-    Set(kProducts, "Env", reg::kRegExpandSz, std::string("%a%\0", 4));
-    Set(kProducts, "Mode", reg::kRegDword, std::string("\x02\0\0\0", 4));
-    Set(kProducts, "Text", reg::kRegSz, std::string("C:\\x\0", 5));
-    Set(std::string(kProducts) + "\\Sub", "", reg::kRegNone, "");
-    std::string file;
-    ASSERT_EQ(0, reg::ExportRegFile(Path(kProducts), &file));
-    EXPECT_EQ("\xFF\xFE", file.substr(0, 2));
-    std::string hexBlob = "\"Blob\"=hex:";
-    for (int i = 0; i < 30; ++i) hexBlob += i == 0 ? "ab" : i == 22 ? ",\\\r\n  ab" : ",ab";
-    EXPECT_EQ("Windows Registry Editor Version 5.00\r\n\r\n"
-              "[HKEY_LOCAL_MACHINE\\Software\\Vantric\\Pex]\r\n" +
-                  hexBlob + "\r\n"
-                  "\"Env\"=hex(2):25,00,61,00,25,00,00,00\r\n"
-                  "\"Mode\"=dword:00000002\r\n"
-                  "\"Text\"=\"C:\\\\x\"\r\n\r\n"
-                  "[HKEY_LOCAL_MACHINE\\Software\\Vantric\\Pex\\Sub]\r\n"
-                  "@=hex(0):\r\n\r\n",
-              reg::FromUtf16(file.substr(2)));
-}
-
 TEST_F(RegFileTest, AMalformedLineIsNamedAndNothingOfTheFileIsImported) {
     for (const pextest::Case& c : pextest::ReadCases("platform/cases/reg_imports.txt")) {
         SCOPED_TRACE(c.where);
@@ -161,31 +138,6 @@ TEST_F(RegFileTest, VersionFourTextsAreSingleByteAndDeletionsApply) {
     EXPECT_EQ("missing", Get("HKCR\\.pex", "Old"));
     EXPECT_EQ(std::string("7:a\0b\0\0", 7), Get("HKCR\\.pex", "Paths"));
     EXPECT_FALSE(KeyExists("HKLM\\Software\\Gone"));
-}
-
-// reg query /s /v NAME: the value in the key and in each subkey that has it, then the count.
-// The plain listing of every type is checked through `pexupdate reg` (the golden run pexupdate_reg).
-TEST_F(RegFileTest, RecursiveQueryOfOneValuePrintsLikeTheWindowsCommand) {
-    const std::string key = std::string(kProducts) + "\\Zendor32";
-    Set(key, "DefaultPath", reg::kRegSz, std::string("C:\\Program Files\\Vantric\0", 25));
-    Set(key, "Mode", reg::kRegDword, std::string("\x1f\0\0\0", 4));
-    Set(key + "\\Beta", "", reg::kRegNone, "");
-    Set(key + "\\alpha", "Mode", reg::kRegExpandSz, std::string("%x%\0", 4));
-    reg::QueryOptions options;
-    options.recursive = options.oneValue = true;
-    options.valueName = "MODE";
-    std::string out;
-    ASSERT_EQ(0, reg::Query(Path("hklm\\Software\\Vantric\\Pex\\Zendor32"), options, &out));
-    EXPECT_EQ("\nHKEY_LOCAL_MACHINE\\Software\\Vantric\\Pex\\Zendor32\n"
-              "    Mode    REG_DWORD    0x1f\n"
-              "\nHKEY_LOCAL_MACHINE\\Software\\Vantric\\Pex\\Zendor32\\alpha\n"
-              "    Mode    REG_EXPAND_SZ    %x%\n"
-              "\nEnd of search: 2 match(es) found.\n",
-              out);
-    options.recursive = false;
-    options.valueName = "Nothing";
-    EXPECT_EQ(2, reg::Query(Path(key), options, &out));
-    EXPECT_EQ(2, reg::Query(Path("HKCU\\Missing"), {}, &out));
 }
 
 TEST_F(RegFileTest, AddDataIsConvertedByType) {
