@@ -5,9 +5,8 @@
 
 #include <gtest/gtest.h>
 
+#include <set>
 
-#include "platform/errors.h"
-#include "platform/files.h"
 #include "platform/paths.h"
 #include "tests/support/test_machine.h"
 #include "tests/support/test_registry.h"
@@ -33,15 +32,19 @@ protected:
         Set("Software\\Vantric\\Pex", "DefaultPath", "C:\\Base");
         machine.WriteFile(kContent, text);
     }
-    // LoadManifest found and loaded the content file.
-    static bool Load(CManifestParser& parser) {
-        bool present = false;
-        return parser.LoadManifest("Zendor32", &present) && present;
-    }
     pextest::TestMachine machine;
     pextest::TraceCapture trace;
     CManifestParser parser;
 };
+
+// The host's special files, given as it spells them, are kept trimmed and upper-cased.
+TEST_F(ManifestParser, SpecialFileNamesAreTrimmedAndUpperCased) {
+    parser.AddToSpecialList(" pellow.exe\n");
+    parser.AddToSpecialList("PELLOW.EXE");
+    EXPECT_EQ(parser.SpecialFiles(), (std::set<std::string>{"PELLOW.EXE"}));
+    parser.ClearSpecialFileList();  // between products
+    EXPECT_TRUE(parser.SpecialFiles().empty());
+}
 
 TEST_F(ManifestParser, DefaultPathIsReadFromTheSectionHeldBeforeInit) {
     Set("Software\\Vantric\\Pex", "DefaultPath", "C:\\Root");
@@ -83,24 +86,9 @@ TEST_F(ManifestParser, DownloadTypeSuitsEveryInterestedParty) {
     EXPECT_EQ(CManifestParser::ConvertCompressionType("RTPatch"), 3u);
 }
 
-// The mode's text is compared exactly; past the last row every field is empty.
-TEST_F(ManifestParser, LoadReadsTheModeAndTheTarget) {
-    Publish("MandatoryOnly", "FileName,UpgradeStatus\na.dll,Downloaded\n");
-    ASSERT_TRUE(Load(parser));
-    EXPECT_TRUE(parser.MandatoryOnly());
-    EXPECT_EQ(parser.ContentFileTarget(), "zendor32.exe");
-    ASSERT_TRUE(parser.MoveToRow(0));
-    EXPECT_FALSE(parser.NextRow());
-    EXPECT_EQ(parser.GetField("FileName"), "");
-
-    Set(kSection, "ContentFileMode", "mandatoryonly");
-    CManifestParser lowerCase;
-    ASSERT_TRUE(Load(lowerCase));
-    EXPECT_FALSE(lowerCase.MandatoryOnly());
-}
-
 // A parser driven for a second product keeps nothing of the first one's content file, also
-// when the second product has none.
+// when the second product has none. A second product that has one, in a mode spelled in
+// another case, is groups_left_out.
 TEST_F(ManifestParser, ARunKeepsNothingOfTheContentFileOfTheRunBefore) {
     Publish("MandatoryOnly", "FileName,UpgradeStatus\r\na.dll,Skipped\r\n");
     EXPECT_EQ(parser.ProcessUpdateInformation(_bstr_t("Zendor32"), nullptr), 0);
