@@ -131,31 +131,13 @@ TEST_F(TraceLogTest, BurstHoldsTheFileButLetsOtherOpenersInBetweenItsLines) {
 }
 
 // Start-up configuration, on a log of its own as the library's start-up uses it. The rotation
-// of the previous log is startup_snapshot_test's.
+// of the previous log, also when its backup cannot be written, is the golden runs'
+// (log_backup_refused, host_calls_twice).
 class TraceStartupTest : public ::testing::Test {
 protected:
     pextest::TestMachine m;
     TraceLog log;
 };
-
-// The previous log goes only once it is safe in the backup: a failed copy keeps it, and the
-// new run's lines follow it.
-TEST_F(TraceStartupTest, RotationKeepsThePreviousLogWhenItsBackupCannotBeWritten) {
-    const std::string logFile = "C:\\Suite\\log\\pex_support_mendler.log";
-    const std::string backup = "C:\\Suite\\log\\pex_support_mendler.bak";
-    m.WriteFile(logFile, "the run before\r\n");
-    m.WriteFile(backup, "two runs before\r\n");
-    plat::fault::FailNth(plat::fault::Op::Copy, 1, plat::kErrorDiskFull);
-    ConfigureTraceLog(log, "C:\\Suite\\Mendler.dll");
-    plat::fault::Clear();
-    TRACE(log, "this run");
-    EXPECT_EQ(pextest::TraceLines(m.ReadFile(logFile)), (Lines{"the run before", "this run"}));
-    EXPECT_EQ(m.ReadFile(backup), "two runs before\r\n");
-
-    ConfigureTraceLog(log, "C:\\Suite\\Mendler.dll");  // the copy succeeds again
-    EXPECT_FALSE(plat::files::Exists(logFile));
-    EXPECT_EQ(pextest::TraceLines(m.ReadFile(backup)), (Lines{"the run before", "this run"}));
-}
 
 TEST_F(TraceStartupTest, CreatesTheLogFolderWithItsParentsAndInstallsTheSubstitution) {
     ConfigureTraceLog(log, "C:\\Deep\\Er\\Mendler.dll");
