@@ -1,5 +1,5 @@
 // The trace log as support staff read it: stamped lines with CR LF ends, the substitution pair,
-// appends that live with other openers, and the rotation to ".bak" at start-up.
+// appends that live with other openers, and where the log goes at start-up.
 #include "diag/trace_log.h"
 
 #include <gtest/gtest.h>
@@ -9,6 +9,7 @@
 #include "platform/errors.h"
 #include "platform/fault.h"
 #include "platform/files.h"
+#include "tests/support/case_file.h"
 #include "tests/support/test_machine.h"
 #include "tests/support/trace_capture.h"
 
@@ -31,29 +32,22 @@ TEST_F(TraceLogTest, ALineIsWrittenWholeHoweverLong) {
     EXPECT_EQ(trace.Bytes().substr(28), "CFile_: Apply 7 [" + text + "] 42%   2.2\r\n");
 }
 
-TEST_F(TraceLogTest, EveryLineEndsInExactlyOneCarriageReturnLineFeed) {
+// Each case: the text traced, the bytes it leaves, the substitution pair in force and whether
+// SetSubstitution refuses it.
+TEST_F(TraceLogTest, LinesOfTheCaseFile) {
     g_TraceLog.timestamps = false;
-    TRACE(g_TraceLog, "plain");
-    TRACE(g_TraceLog, "bare line feed\n");
-    TRACE(g_TraceLog, "already windows\r\n");
-    TRACE(g_TraceLog, "first\nsecond");
+    for (const pextest::Case& c : pextest::ReadCases("diag/cases/trace_lines.txt")) {
+        SCOPED_TRACE(c.where);
+        trace.Clear();
+        EXPECT_EQ(g_TraceLog.SetSubstitution(c[2], c[3]), c[4] != "refused");
+        TRACE(g_TraceLog, "%s", pextest::Unescape(c[0]).c_str());
+        EXPECT_EQ(trace.Bytes(), pextest::Unescape(c[1]));
+    }
+    trace.Clear();
     TRACE(g_TraceLog, "%s", "");
-    g_TraceLog.ensureNewline = false;
+    g_TraceLog.ensureNewline = false;  // then a line ends as the caller ends it
     TRACE(g_TraceLog, "no end");
-    EXPECT_EQ(trace.Bytes(), "plain\r\nbare line feed\r\nalready windows\r\nfirst\r\nsecond\r\n\r\nno end");
-}
-
-TEST_F(TraceLogTest, SubstitutionReplacesEveryOccurrenceFromTheStartAgain) {
-    ASSERT_TRUE(g_TraceLog.SetSubstitution("secret", "***"));
-    TRACE(g_TraceLog, "a secret and a secret");
-    TRACE(g_TraceLog, "nothing here");
-    ASSERT_TRUE(g_TraceLog.SetSubstitution("ab", "a"));
-    TRACE(g_TraceLog, "aabb");  // aabb -> aab -> aa: each search starts at the beginning
-    ASSERT_TRUE(g_TraceLog.SetSubstitution("", "x"));
-    TRACE(g_TraceLog, "secret ab");
-    EXPECT_FALSE(g_TraceLog.SetSubstitution("a", "aa"));  // would never finish
-    TRACE(g_TraceLog, "a");
-    EXPECT_EQ(trace.Lines(), (Lines{"a *** and a ***", "nothing here", "aa", "secret ab", "a"}));
+    EXPECT_EQ(trace.Bytes(), "\r\nno end");
 }
 
 TEST_F(TraceLogTest, AppendsWhileAnotherProgramHoldsTheFileShared) {
