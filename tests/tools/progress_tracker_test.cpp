@@ -48,16 +48,13 @@ std::vector<std::string> Parse(const std::string& text) {
             events.push_back(event);
             continue;
         }
-        const int rows = std::stoi(event.substr(1)), steps = std::stoi(event.substr(event.find('x') + 1));
-        events.push_back("A");
-        for (int row = 0; row < rows; ++row) events.push_back("Af" + std::to_string(row));
-        events.push_back("T" + std::to_string(steps));
-        events.push_back("D");
-        for (int step = 0; step < steps; ++step) {
-            events.push_back("Xf" + std::to_string(step));
-            events.push_back("I");
-        }
-        events.push_back("F");
+        std::string product = "A";
+        for (int row = 0; row < std::stoi(event.substr(1)); ++row) product += " Af" + std::to_string(row);
+        const std::string steps = event.substr(event.find('x') + 1);
+        product += " T" + steps + " D";
+        for (int step = 0; step < std::stoi(steps); ++step) product += " Xf" + std::to_string(step) + " I";
+        const std::vector<std::string> expanded = Parse(product + " F");
+        events.insert(events.end(), expanded.begin(), expanded.end());
     }
     return events;
 }
