@@ -15,12 +15,8 @@ namespace reg = plat::reg;
 
 namespace {
 
-class SnapshotTest : public ::testing::Test {
-protected:
+TEST(SnapshotTest, RegistryKeysAreDumpedOrReported) {
     pextest::TestMachine machine;
-};
-
-TEST_F(SnapshotTest, RegistryKeysAreDumpedOrReported) {
     pextest::CreateRegKey(reg::kLocalMachine, "Software\\Vantric\\Pex");
     pextest::TraceCapture trace;
     LogRegistryKeys("HKLM\\Software\\Vantric\r\nhklm\\Software\r\nHKCU\\Software\\Missing\r\nNoRoot\r\n");
@@ -36,7 +32,8 @@ TEST_F(SnapshotTest, RegistryKeysAreDumpedOrReported) {
                              }));
 }
 
-TEST_F(SnapshotTest, AFileWithoutVersionInformationIsVersionZero) {
+TEST(SnapshotTest, AFileWithoutVersionInformationIsVersionZero) {
+    pextest::TestMachine machine;
     machine.WriteFile("C:\\Suite\\Mendler.dll", "not a module");
     EXPECT_STREQ(ModuleVersion("C:\\Suite\\Mendler.dll").Text(true), "Version 00.00.00.00");
     EXPECT_STREQ(ModuleVersion("C:\\Suite\\Mendler.dll").Text(false), "Version 0.0.0.0");

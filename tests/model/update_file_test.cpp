@@ -13,12 +13,8 @@
 
 namespace {
 
-constexpr char kDownload[] = "C:\\Cache\\a.dll";
-
 class UpdateFile : public ::testing::Test {
 protected:
-    void SetUp() override { machine.WriteFile(kDownload, "new"); }
-
     pextest::TestMachine machine;
     pextest::TraceCapture trace;
 };
@@ -26,7 +22,8 @@ protected:
 // Blanks are a command list of their own, run, that finds nothing to do (a content file's cell
 // of blanks reaches no command at all: rollback_beside_backups).
 TEST_F(UpdateFile, BlanksAreRunAsACommandList) {
-    CFile_ blanks(7, true, false, "C:\\App\\Sub", "a.dll", kDownload, "   ", "", false, 0);
+    machine.WriteFile("C:\\Cache\\a.dll", "new");
+    CFile_ blanks(7, true, false, "C:\\App\\Sub", "a.dll", "C:\\Cache\\a.dll", "   ", "", false, 0);
     EXPECT_EQ(1, blanks.Apply());
     EXPECT_TRUE(trace.Contains("CFile_: Command(s) found:    "));
 }
