@@ -82,34 +82,30 @@ protected:
     pextest::TraceCapture trace;
 };
 
-// A missing group and an empty one count as applied.
+// A missing group and an empty one count as applied; an unnamed group is never checked, but
+// the empty name, which sorts first, finds it.
 TEST_F(Dependancies, AGroupWaitsUntilEveryMemberOfItsDependancyIsApplied) {
     CMasterList list;
+    list.AddFile("", Row(1), "Missing;Waits");
     list.AddFile("App", Row(3), "base;Missing");
     list.AddFile("BASE", Row(1), "");
     list.AddFile("Base", Row(2), "");
     list.AddNewFileGroup("Empty");
     list.AddFile("Waits", Row(4), "EMPTY;gone");
+    list.AddFile("Unnamed", Row(5), "A;;B");
     EXPECT_TRUE(list.DependedOnItemsApplied(Group(list, "Waits")));
+    EXPECT_TRUE(list.DependedOnItemsApplied(list.begin()));
+    EXPECT_FALSE(trace.Contains("CMasterList examining dependancy 'Waits'"));
     // The trace of each step is the golden runs' (group_rollback_and_statuses, failed_restore).
     const auto app = Group(list, "App");
     EXPECT_FALSE(list.DependedOnItemsApplied(app));
-
     ApplyAll(Group(list, "BASE")->second);
     EXPECT_TRUE(list.DependedOnItemsApplied(app));
-}
 
-TEST_F(Dependancies, UnnamedGroupsAreNeverCheckedButTheEmptyNameFindsThem) {
-    CMasterList list;
-    list.AddFile("", Row(1), "Missing;Waits");
-    list.AddFile("Waits", Row(2), "A;;B");
-    EXPECT_TRUE(list.DependedOnItemsApplied(list.begin()));
-    EXPECT_FALSE(trace.Contains("CMasterList examining dependancy 'Missing'"));
-    // "" sorts first and finds the unnamed group, whose member is not applied.
-    EXPECT_FALSE(list.DependedOnItemsApplied(Group(list, "Waits")));
+    EXPECT_FALSE(list.DependedOnItemsApplied(Group(list, "Unnamed")));
     EXPECT_TRUE(trace.Contains("CMasterList found dependancy ''"));
     ApplyAll(list.begin()->second);
-    EXPECT_TRUE(list.DependedOnItemsApplied(Group(list, "Waits")));
+    EXPECT_TRUE(list.DependedOnItemsApplied(Group(list, "Unnamed")));
 }
 
 }  // namespace
