@@ -127,13 +127,9 @@ TEST_F(TraceLogTest, BurstHoldsTheFileButLetsOtherOpenersInBetweenItsLines) {
 // Start-up configuration, on a log of its own as the library's start-up uses it. The rotation
 // of the previous log, also when its backup cannot be written, is the golden runs'
 // (log_backup_refused, host_calls_twice).
-class TraceStartupTest : public ::testing::Test {
-protected:
+TEST(TraceStartupTest, CreatesTheLogFolderWithItsParentsAndInstallsTheSubstitution) {
     pextest::TestMachine m;
     TraceLog log;
-};
-
-TEST_F(TraceStartupTest, CreatesTheLogFolderWithItsParentsAndInstallsTheSubstitution) {
     ConfigureTraceLog(log, "C:\\Deep\\Er\\Mendler.dll");
     EXPECT_EQ(log.FileName(), "C:\\Deep\\Er\\log\\pex_support_mendler.log");
     EXPECT_TRUE(log.fileOutput);

@@ -44,7 +44,6 @@ TEST(ContentTableLoad, TextsOfTheCaseFile) {
 
 std::string Repeat(const std::string& text, std::size_t times) {
     std::string out;
-    out.reserve(text.size() * times);
     for (std::size_t i = 0; i < times; ++i) out += text;
     return out;
 }

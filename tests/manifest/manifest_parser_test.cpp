@@ -24,14 +24,6 @@ protected:
     static void Set(const std::string& key, const std::string& name, const std::string& value) {
         pextest::SetRegText(reg::kLocalMachine, key, name, value);
     }
-    // Registers Zendor32's content file, in the mode, with these bytes.
-    void Publish(const std::string& mode, const std::string& text) {
-        Set(kSection, "ContentFileName", kContent);
-        Set(kSection, "ContentFileMode", mode);
-        Set(kSection, "ContentFileTarget", "zendor32.exe");
-        Set("Software\\Vantric\\Pex", "DefaultPath", "C:\\Base");
-        machine.WriteFile(kContent, text);
-    }
     pextest::TestMachine machine;
     pextest::TraceCapture trace;
     CManifestParser parser;
@@ -83,14 +75,16 @@ TEST_F(ManifestParser, DownloadTypeSuitsEveryInterestedParty) {
     EXPECT_EQ(CManifestParser::PickBest(2, {}), 1u);
     EXPECT_EQ(CManifestParser::PickBest(2, {3}), 0u);
     EXPECT_EQ(CManifestParser::NextWorst(0), 0u);
-    EXPECT_EQ(CManifestParser::ConvertCompressionType("RTPatch"), 3u);
 }
 
 // A parser driven for a second product keeps nothing of the first one's content file, also
 // when the second product has none. A second product that has one, in a mode spelled in
 // another case, is groups_left_out.
 TEST_F(ManifestParser, ARunKeepsNothingOfTheContentFileOfTheRunBefore) {
-    Publish("MandatoryOnly", "FileName,UpgradeStatus\r\na.dll,Skipped\r\n");
+    Set(kSection, "ContentFileName", kContent);
+    Set(kSection, "ContentFileMode", "MandatoryOnly");
+    Set(kSection, "ContentFileTarget", "zendor32.exe");
+    machine.WriteFile(kContent, "FileName,UpgradeStatus\r\na.dll,Skipped\r\n");
     EXPECT_EQ(parser.ProcessUpdateInformation(_bstr_t("Zendor32"), nullptr), 0);
     ASSERT_TRUE(parser.MandatoryOnly());
     pextest::CreateRegKey(reg::kLocalMachine, "Software\\Vantric\\Pex\\Orlandel");
