@@ -1,5 +1,5 @@
 // The trace log as support staff read it: stamped lines with CR LF ends, the substitution pair,
-// appends that live with other openers, and the rotation to ".bak" at start-up.
+// appends that live with other openers, and where the log goes at start-up.
 #include "diag/trace_log.h"
 
 #include <gtest/gtest.h>
@@ -9,6 +9,7 @@
 #include "platform/errors.h"
 #include "platform/fault.h"
 #include "platform/files.h"
+#include "tests/support/case_file.h"
 #include "tests/support/test_machine.h"
 #include "tests/support/trace_capture.h"
 
@@ -31,29 +32,22 @@ TEST_F(TraceLogTest, ALineIsWrittenWholeHoweverLong) {
     EXPECT_EQ(trace.Bytes().substr(28), "CFile_: Apply 7 [" + text + "] 42%   2.2\r\n");
 }
 
-TEST_F(TraceLogTest, EveryLineEndsInExactlyOneCarriageReturnLineFeed) {
+// Each case: the text traced, the bytes it leaves, the substitution pair in force and whether
+// SetSubstitution refuses it.
+TEST_F(TraceLogTest, LinesOfTheCaseFile) {
     g_TraceLog.timestamps = false;
-    TRACE(g_TraceLog, "plain");
-    TRACE(g_TraceLog, "bare line feed\n");
-    TRACE(g_TraceLog, "already windows\r\n");
-    TRACE(g_TraceLog, "first\nsecond");
+    for (const pextest::Case& c : pextest::ReadCases("diag/cases/trace_lines.txt")) {
+        SCOPED_TRACE(c.where);
+        trace.Clear();
+        EXPECT_EQ(g_TraceLog.SetSubstitution(c[2], c[3]), c[4] != "refused");
+        TRACE(g_TraceLog, "%s", pextest::Unescape(c[0]).c_str());
+        EXPECT_EQ(trace.Bytes(), pextest::Unescape(c[1]));
+    }
+    trace.Clear();
     TRACE(g_TraceLog, "%s", "");
-    g_TraceLog.ensureNewline = false;
+    g_TraceLog.ensureNewline = false;  // then a line ends as the caller ends it
     TRACE(g_TraceLog, "no end");
-    EXPECT_EQ(trace.Bytes(), "plain\r\nbare line feed\r\nalready windows\r\nfirst\r\nsecond\r\n\r\nno end");
-}
-
-TEST_F(TraceLogTest, SubstitutionReplacesEveryOccurrenceFromTheStartAgain) {
-    ASSERT_TRUE(g_TraceLog.SetSubstitution("secret", "***"));
-    TRACE(g_TraceLog, "a secret and a secret");
-    TRACE(g_TraceLog, "nothing here");
-    ASSERT_TRUE(g_TraceLog.SetSubstitution("ab", "a"));
-    TRACE(g_TraceLog, "aabb");  // aabb -> aab -> aa: each search starts at the beginning
-    ASSERT_TRUE(g_TraceLog.SetSubstitution("", "x"));
-    TRACE(g_TraceLog, "secret ab");
-    EXPECT_FALSE(g_TraceLog.SetSubstitution("a", "aa"));  // would never finish
-    TRACE(g_TraceLog, "a");
-    EXPECT_EQ(trace.Lines(), (Lines{"a *** and a ***", "nothing here", "aa", "secret ab", "a"}));
+    EXPECT_EQ(trace.Bytes(), "\r\nno end");
 }
 
 TEST_F(TraceLogTest, AppendsWhileAnotherProgramHoldsTheFileShared) {
@@ -76,10 +70,9 @@ TEST_F(TraceLogTest, FileThatCannotBeOpenedSwitchesFileOutputOff) {
     TRACE(g_TraceLog, "also lost: the rest of the run writes nowhere");
     EXPECT_EQ(trace.Bytes(), "");
 
-    // The next run tries the file again; a log switched off on purpose stays off.
+    // The next run tries the file again (run_guard_test); a log switched off on purpose stays off.
     g_TraceLog.ResumeFileOutput();
-    TRACE(g_TraceLog, "next run");
-    EXPECT_EQ(trace.Lines(), Lines{"next run"});
+    EXPECT_TRUE(g_TraceLog.fileOutput);
     g_TraceLog.fileOutput = false;
     g_TraceLog.ResumeFileOutput();
     EXPECT_FALSE(g_TraceLog.fileOutput);
@@ -93,18 +86,6 @@ TEST_F(TraceLogTest, FailedWriteDropsThatLineOnly) {
     TRACE(g_TraceLog, "dropped\nwhole");
     TRACE(g_TraceLog, "next");
     EXPECT_EQ(trace.Bytes(), "first\r\nnext\r\n");
-}
-
-TEST_F(TraceLogTest, KeepOpenHoldsTheFileBetweenLines) {
-    g_TraceLog.keepOpen = true;
-    TRACE(g_TraceLog, "burst 1");
-    EXPECT_TRUE(g_TraceLog.IsOpen());
-    TRACE(g_TraceLog, "burst 2");
-    g_TraceLog.keepOpen = false;
-    EXPECT_TRUE(g_TraceLog.IsOpen());
-    TRACE(g_TraceLog, "after");
-    EXPECT_FALSE(g_TraceLog.IsOpen());
-    EXPECT_EQ(trace.Lines(), (Lines{"burst 1", "burst 2", "after"}));
 }
 
 // The log's host path is mapped once; a folder spelled otherwise since then fails the open,
@@ -121,53 +102,34 @@ TEST_F(TraceLogTest, FolderMadeAgainInAnotherCaseIsFoundAfterAFailedOpen) {
     EXPECT_EQ(pextest::TraceLines(m.ReadFile("C:\\logs\\run.log")), Lines{"after"});
 }
 
-// On the emulated machine the share lock is let go between the lines of a burst, as it was
-// before a line held it: a reader that denies writers gets in, and the line that meets it is
-// dropped. Windows refuses that reader while the burst's handle is open for writing.
-TEST_F(TraceLogTest, BurstLetsOtherOpenersInBetweenItsLines) {
-#ifdef _WIN32
-    GTEST_SKIP() << "Windows keeps a deny-write reader out while the log is open for writing";
-#endif
+// A burst holds the file open between its lines. On the emulated machine the share lock is
+// let go between them, as it was before a line held it: a reader that denies writers gets in,
+// and the line that meets it is dropped. Windows refuses that reader while the burst's handle
+// is open for writing.
+TEST_F(TraceLogTest, BurstHoldsTheFileButLetsOtherOpenersInBetweenItsLines) {
     g_TraceLog.keepOpen = true;
     TRACE(g_TraceLog, "burst 1");
+    EXPECT_TRUE(g_TraceLog.IsOpen());
+#ifndef _WIN32
     plat::CFile reader;
     ASSERT_TRUE(reader.Open(trace.Path(), plat::CFile::modeRead | plat::CFile::shareDenyWrite));
     TRACE(g_TraceLog, "dropped");
     reader.Close();
+#endif
     TRACE(g_TraceLog, "burst 2");
     g_TraceLog.keepOpen = false;
+    EXPECT_TRUE(g_TraceLog.IsOpen());
     TRACE(g_TraceLog, "after");
+    EXPECT_FALSE(g_TraceLog.IsOpen());
     EXPECT_EQ(trace.Lines(), (Lines{"burst 1", "burst 2", "after"}));
 }
 
 // Start-up configuration, on a log of its own as the library's start-up uses it. The rotation
-// of the previous log is startup_snapshot_test's.
-class TraceStartupTest : public ::testing::Test {
-protected:
+// of the previous log, also when its backup cannot be written, is the golden runs'
+// (log_backup_refused, host_calls_twice).
+TEST(TraceStartupTest, CreatesTheLogFolderWithItsParentsAndInstallsTheSubstitution) {
     pextest::TestMachine m;
     TraceLog log;
-};
-
-// The previous log goes only once it is safe in the backup: a failed copy keeps it, and the
-// new run's lines follow it.
-TEST_F(TraceStartupTest, RotationKeepsThePreviousLogWhenItsBackupCannotBeWritten) {
-    const std::string logFile = "C:\\Suite\\log\\pex_support_mendler.log";
-    const std::string backup = "C:\\Suite\\log\\pex_support_mendler.bak";
-    m.WriteFile(logFile, "the run before\r\n");
-    m.WriteFile(backup, "two runs before\r\n");
-    plat::fault::FailNth(plat::fault::Op::Copy, 1, plat::kErrorDiskFull);
-    ConfigureTraceLog(log, "C:\\Suite\\Mendler.dll");
-    plat::fault::Clear();
-    TRACE(log, "this run");
-    EXPECT_EQ(pextest::TraceLines(m.ReadFile(logFile)), (Lines{"the run before", "this run"}));
-    EXPECT_EQ(m.ReadFile(backup), "two runs before\r\n");
-
-    ConfigureTraceLog(log, "C:\\Suite\\Mendler.dll");  // the copy succeeds again
-    EXPECT_FALSE(plat::files::Exists(logFile));
-    EXPECT_EQ(pextest::TraceLines(m.ReadFile(backup)), (Lines{"the run before", "this run"}));
-}
-
-TEST_F(TraceStartupTest, CreatesTheLogFolderWithItsParentsAndInstallsTheSubstitution) {
     ConfigureTraceLog(log, "C:\\Deep\\Er\\Mendler.dll");
     EXPECT_EQ(log.FileName(), "C:\\Deep\\Er\\log\\pex_support_mendler.log");
     EXPECT_TRUE(log.fileOutput);

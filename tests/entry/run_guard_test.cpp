@@ -10,7 +10,6 @@
 #include "platform/files.h"
 #include "platform/machine.h"
 #include "tests/pipeline/pipeline_fixture.h"
-#include "tests/support/test_registry.h"
 
 #ifndef _WIN32
 #include <signal.h>
@@ -28,15 +27,7 @@ protected:
         for (const char* name : {"a.dll", "b.dll"}) machine.WriteFile(std::string(kHome) + "\\" + name, "old");
         Publish({Row("a.dll", "new a", "G"), Row("b.dll", "new b", "G")});
     }
-    void TearDown() override {
-        plat::SetMachineLockWaitCap(plat::kNoMachineLockWaitCap);
-    }
-
-    void ExpectApplied() const {
-        EXPECT_EQ(Installed("a.dll"), "new a");
-        EXPECT_EQ(Installed("b.dll"), "new b");
-        EXPECT_FALSE(ContentEntriesPresent());
-    }
+    void TearDown() override { plat::SetMachineLockWaitCap(plat::kNoMachineLockWaitCap); }
 };
 
 // A trace file that cannot be opened is lost for the rest of that run only.
@@ -44,68 +35,48 @@ TEST_F(RunGuard, EachRunTriesALostTraceFileAgain) {
     pextest::TraceCapture later("C:\\Later\\trace.log");
     TRACE(g_TraceLog, "lost: the folder is missing");
     EXPECT_FALSE(g_TraceLog.fileOutput);
-    machine.WriteFile("C:\\Later\\other.txt", "");
+    ASSERT_TRUE(plat::files::MakeDirectory("C:\\Later"));
     UpdateAll(nullptr);
     EXPECT_TRUE(later.Contains("UpdateAll, main key is open"));
 
     later.Clear();
-    plat::files::Remove("C:\\Later\\other.txt");
     ASSERT_TRUE(plat::files::RemoveDirectory("C:\\Later"));
     TRACE(g_TraceLog, "lost again");
-    machine.WriteFile("C:\\Later\\other.txt", "");
+    ASSERT_TRUE(plat::files::MakeDirectory("C:\\Later"));
     CManifestParser parser;  // a host driving a parser alone starts a run too
     parser.ProcessUpdateInformation(_bstr_t(kProduct), nullptr);
     EXPECT_TRUE(later.Contains("CManifestParser: ProcessUpdateInformation"));
 }
 
 #ifndef _WIN32
-// Another process of the machine that holds the product-run lock until it is killed.
-class OtherProcessHoldingTheLock {
-public:
-    OtherProcessHoldingTheLock() {
-        int ready[2];
-        if (pipe(ready) != 0) return;
-        child_ = fork();
-        if (child_ == 0) {
-            plat::MachineLock lock(kProductRunLockName);
-            const char held = lock.Acquire(0) ? 'y' : 'n';
-            while (write(ready[1], &held, 1) == 1) pause();  // until killed
-            _exit(1);  // no destructors: the parent's test objects are not the child's
-        }
-        char held = 'n';
-        holding_ = child_ > 0 && read(ready[0], &held, 1) == 1 && held == 'y';
-        close(ready[0]);
-        close(ready[1]);
-    }
-    ~OtherProcessHoldingTheLock() { Kill(); }
-    bool Holding() const { return holding_; }
-    void Kill() {  // as a crash would end it
-        if (child_ <= 0) return;
-        kill(child_, SIGKILL);
-        waitpid(child_, nullptr, 0);
-        child_ = -1;
-    }
-
-private:
-    pid_t child_ = -1;
-    bool holding_ = false;
-};
-
 // Once another process that held the machine's update lock is gone, even killed while it held
 // it, a product run goes ahead (the golden run update_lock_held shows the run given up while the
 // lock is held).
 TEST_F(RunGuard, ALockLeftByAKilledProcessIsTakenOver) {
     plat::SetMachineLockWaitCap(0);
-    OtherProcessHoldingTheLock other;
-    ASSERT_TRUE(other.Holding());
+    int ready[2];
+    ASSERT_EQ(pipe(ready), 0);
+    const pid_t other = fork();
+    if (other == 0) {
+        plat::MachineLock lock(kProductRunLockName);
+        if (lock.Acquire(0) && write(ready[1], "y", 1) == 1) pause();  // until killed
+        _exit(1);  // no destructors: the parent's test objects are not the child's
+    }
+    close(ready[1]);
+    char held = 'n';
+    ASSERT_EQ(read(ready[0], &held, 1), 1) << "the other process did not take the lock";
+    close(ready[0]);
     {
         CManifestParser parser;
         EXPECT_EQ(parser.ProcessUpdateInformation(_bstr_t(kProduct), nullptr), 1);
     }
-    other.Kill();
+    kill(other, SIGKILL);  // as a crash would end it
+    waitpid(other, nullptr, 0);
     CManifestParser parser;
     EXPECT_EQ(parser.ProcessUpdateInformation(_bstr_t(kProduct), nullptr), 0);
-    ExpectApplied();
+    EXPECT_EQ(Installed("a.dll"), "new a");
+    EXPECT_EQ(Installed("b.dll"), "new b");
+    EXPECT_FALSE(ContentEntriesPresent());
 }
 
 // Two hosts started at once on one machine, each updating every product: each file is applied
@@ -128,10 +99,10 @@ TEST_F(RunGuard, TwoProcessesStartedAtOnceApplyEveryFile) {
         if (child == 0) {
             close(start[1]);
             char go;
-            const bool started = read(start[0], &go, 1) == 0;  // the parent closed its end
+            if (read(start[0], &go, 1) != 0) _exit(1);  // goes on when the parent closes its end
             g_TraceLog.enabled = false;
-            if (started) UpdateAll(nullptr);
-            _exit(started ? 0 : 1);
+            UpdateAll(nullptr);
+            _exit(0);
         }
     }
     close(start[0]);
@@ -141,10 +112,8 @@ TEST_F(RunGuard, TwoProcessesStartedAtOnceApplyEveryFile) {
         waitpid(child, &status, 0);
         EXPECT_TRUE(WIFEXITED(status) && WEXITSTATUS(status) == 0);
     }
-    int old = 0;
     for (int i = 0; i < kFiles; ++i)
-        old += Installed("f" + std::to_string(i) + ".dll") != "new " + std::to_string(i) ? 1 : 0;
-    EXPECT_EQ(old, 0) << "targets left without their update";
+        EXPECT_EQ(Installed("f" + std::to_string(i) + ".dll"), "new " + std::to_string(i));
     EXPECT_FALSE(plat::files::Exists(kContent));
     EXPECT_FALSE(ContentEntriesPresent());
 }

@@ -1,4 +1,5 @@
-// Hostile sizes: a huge cell, a line of a million separators, a million tiny rows. Each load runs
+// Hostile sizes: a huge cell, a line of a million separators, a million tiny rows (short rows
+// under a header too wide are refused at its line: content_table_test's bounds). Each load runs
 // in a child process under an address-space limit, so that a load whose memory grows faster than
 // its input fails the test instead of passing on a machine with room to spare.
 #include <gtest/gtest.h>
@@ -49,14 +50,6 @@ TEST(ContentTableLimits, HugeInputsLoadOrFailWithinMemoryLinearInTheirSize) {
         CContentTable table;
         return table.LoadFromText(std::string(1000000, ',') + "\r\nx\r\n") < 0;
     })) << "a header of a million separators";
-    EXPECT_TRUE(InLimitedChild([] {
-        std::string text;
-        for (int column = 0; column < 5000; ++column) text += "c" + std::to_string(column) + ",";
-        text += "\r\n";
-        for (int row = 0; row < 200000; ++row) text += "x\r\n";
-        CContentTable table;
-        return table.LoadFromText(text) < 0;
-    })) << "short rows under a wide header, a billion cells once filled up";
     EXPECT_TRUE(InLimitedChild([] {
         std::string text = kHeader;
         for (int row = 0; row < 1000000; ++row) text += "x\n";

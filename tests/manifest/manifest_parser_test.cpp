@@ -5,9 +5,8 @@
 
 #include <gtest/gtest.h>
 
+#include <set>
 
-#include "platform/errors.h"
-#include "platform/files.h"
 #include "platform/paths.h"
 #include "tests/support/test_machine.h"
 #include "tests/support/test_registry.h"
@@ -25,23 +24,19 @@ protected:
     static void Set(const std::string& key, const std::string& name, const std::string& value) {
         pextest::SetRegText(reg::kLocalMachine, key, name, value);
     }
-    // Registers Zendor32's content file, in the mode, with these bytes.
-    void Publish(const std::string& mode, const std::string& text) {
-        Set(kSection, "ContentFileName", kContent);
-        Set(kSection, "ContentFileMode", mode);
-        Set(kSection, "ContentFileTarget", "zendor32.exe");
-        Set("Software\\Vantric\\Pex", "DefaultPath", "C:\\Base");
-        machine.WriteFile(kContent, text);
-    }
-    // LoadManifest found and loaded the content file.
-    static bool Load(CManifestParser& parser) {
-        bool present = false;
-        return parser.LoadManifest("Zendor32", &present) && present;
-    }
     pextest::TestMachine machine;
     pextest::TraceCapture trace;
     CManifestParser parser;
 };
+
+// The host's special files, given as it spells them, are kept trimmed and upper-cased.
+TEST_F(ManifestParser, SpecialFileNamesAreTrimmedAndUpperCased) {
+    parser.AddToSpecialList(" pellow.exe\n");
+    parser.AddToSpecialList("PELLOW.EXE");
+    EXPECT_EQ(parser.SpecialFiles(), (std::set<std::string>{"PELLOW.EXE"}));
+    parser.ClearSpecialFileList();  // between products
+    EXPECT_TRUE(parser.SpecialFiles().empty());
+}
 
 TEST_F(ManifestParser, DefaultPathIsReadFromTheSectionHeldBeforeInit) {
     Set("Software\\Vantric\\Pex", "DefaultPath", "C:\\Root");
@@ -80,29 +75,16 @@ TEST_F(ManifestParser, DownloadTypeSuitsEveryInterestedParty) {
     EXPECT_EQ(CManifestParser::PickBest(2, {}), 1u);
     EXPECT_EQ(CManifestParser::PickBest(2, {3}), 0u);
     EXPECT_EQ(CManifestParser::NextWorst(0), 0u);
-    EXPECT_EQ(CManifestParser::ConvertCompressionType("RTPatch"), 3u);
-}
-
-// The mode's text is compared exactly; past the last row every field is empty.
-TEST_F(ManifestParser, LoadReadsTheModeAndTheTarget) {
-    Publish("MandatoryOnly", "FileName,UpgradeStatus\na.dll,Downloaded\n");
-    ASSERT_TRUE(Load(parser));
-    EXPECT_TRUE(parser.MandatoryOnly());
-    EXPECT_EQ(parser.ContentFileTarget(), "zendor32.exe");
-    ASSERT_TRUE(parser.MoveToRow(0));
-    EXPECT_FALSE(parser.NextRow());
-    EXPECT_EQ(parser.GetField("FileName"), "");
-
-    Set(kSection, "ContentFileMode", "mandatoryonly");
-    CManifestParser lowerCase;
-    ASSERT_TRUE(Load(lowerCase));
-    EXPECT_FALSE(lowerCase.MandatoryOnly());
 }
 
 // A parser driven for a second product keeps nothing of the first one's content file, also
-// when the second product has none.
+// when the second product has none. A second product that has one, in a mode spelled in
+// another case, is groups_left_out.
 TEST_F(ManifestParser, ARunKeepsNothingOfTheContentFileOfTheRunBefore) {
-    Publish("MandatoryOnly", "FileName,UpgradeStatus\r\na.dll,Skipped\r\n");
+    Set(kSection, "ContentFileName", kContent);
+    Set(kSection, "ContentFileMode", "MandatoryOnly");
+    Set(kSection, "ContentFileTarget", "zendor32.exe");
+    machine.WriteFile(kContent, "FileName,UpgradeStatus\r\na.dll,Skipped\r\n");
     EXPECT_EQ(parser.ProcessUpdateInformation(_bstr_t("Zendor32"), nullptr), 0);
     ASSERT_TRUE(parser.MandatoryOnly());
     pextest::CreateRegKey(reg::kLocalMachine, "Software\\Vantric\\Pex\\Orlandel");

@@ -11,24 +11,24 @@
 
 namespace {
 
-// One change the library makes to the record before calling the host.
-struct Event {
-    enum Kind { Status, Total, Increment } kind;
-    std::string text;
-    std::int32_t value;
-};
-Event Status(const std::string& text) { return {Event::Status, text, 0}; }
-Event Total(std::int32_t value) { return {Event::Total, "", value}; }
-Event Increment() { return {Event::Increment, "", 0}; }
+// Makes one change of a case's text to the record, as the library does before calling the host.
+void Change(CProgressData& record, const std::string& event) {
+    if (event == "I") record.IncrementCurrentStep();
+    else if (event[0] == 'T') record.SetTotalSteps(std::stoi(event.substr(1)));
+    else if (event == "A") record.SetStatusText("Analyzing data...");
+    else if (event[0] == 'A') record.SetStatusText("Analyzing " + event.substr(1));
+    else if (event[0] == 'X') record.SetStatusText("Applying " + event.substr(1));
+    else if (event == "D") record.SetStatusText("Decompressing...");
+    else if (event == "F") record.SetStatusText("Finished.");
+    else ADD_FAILURE() << "unknown event " << event;
+}
 
 // What the display shows after each event: "step/total product of count".
 std::vector<std::string> Replay(CProgressData& record, pextool::ProgressTracker& tracker,
-                                const std::vector<Event>& events) {
+                                const std::vector<std::string>& events) {
     std::vector<std::string> shown;
-    for (const Event& event : events) {
-        if (event.kind == Event::Status) record.SetStatusText(event.text);
-        if (event.kind == Event::Total) record.SetTotalSteps(event.value);
-        if (event.kind == Event::Increment) record.IncrementCurrentStep();
+    for (const std::string& event : events) {
+        Change(record, event);
         const pextool::ProgressView view = tracker.Observe(record);
         EXPECT_LE(view.step, view.stepTotal);
         EXPECT_LE(view.product, view.productCount);
@@ -38,35 +38,23 @@ std::vector<std::string> Replay(CProgressData& record, pextool::ProgressTracker&
     return shown;
 }
 
-// One product as ProcessUpdateInformation reports it: analysis of its rows, its total, its steps.
-std::vector<Event> Product(std::int32_t rows, std::int32_t steps) {
-    std::vector<Event> events{Status("Analyzing data...")};
-    for (std::int32_t row = 0; row < rows; ++row) events.push_back(Status("Analyzing f" + std::to_string(row)));
-    events.push_back(Total(steps));
-    events.push_back(Status("Decompressing..."));
-    for (std::int32_t step = 0; step < steps; ++step) {
-        events.push_back(Status("Applying f" + std::to_string(step)));
-        events.push_back(Increment());
-    }
-    events.push_back(Status("Finished."));
-    return events;
-}
-
-// The events of a case's text (its file says how they are written).
-std::vector<Event> Parse(const std::string& text) {
-    std::vector<Event> events;
+// The events of a case's text, each product (PrxS) written out as ProcessUpdateInformation
+// reports it: analysis of its rows, its total, then each step applied.
+std::vector<std::string> Parse(const std::string& text) {
+    std::vector<std::string> events;
     std::istringstream in(text);
-    for (std::string t; in >> t;) {
-        if (t == "I") events.push_back(Increment());
-        else if (t[0] == 'T') events.push_back(Total(std::stoi(t.substr(1))));
-        else if (t == "A") events.push_back(Status("Analyzing data..."));
-        else if (t[0] == 'A') events.push_back(Status("Analyzing " + t.substr(1)));
-        else if (t == "D") events.push_back(Status("Decompressing..."));
-        else if (t == "F") events.push_back(Status("Finished."));
-        else if (t[0] == 'P') {
-            const std::vector<Event> product = Product(std::stoi(t.substr(1)), std::stoi(t.substr(t.find('x') + 1)));
-            events.insert(events.end(), product.begin(), product.end());
-        } else ADD_FAILURE() << "unknown event " << t;
+    for (std::string event; in >> event;) {
+        if (event[0] != 'P') {
+            events.push_back(event);
+            continue;
+        }
+        std::string product = "A";
+        for (int row = 0; row < std::stoi(event.substr(1)); ++row) product += " Af" + std::to_string(row);
+        const std::string steps = event.substr(event.find('x') + 1);
+        product += " T" + steps + " D";
+        for (int step = 0; step < std::stoi(steps); ++step) product += " Xf" + std::to_string(step) + " I";
+        const std::vector<std::string> expanded = Parse(product + " F");
+        events.insert(events.end(), expanded.begin(), expanded.end());
     }
     return events;
 }
@@ -75,29 +63,25 @@ TEST(ProgressTracker, ShownOverRecordedSequences) {
     for (const pextest::Case& c : pextest::ReadCases("tools/cases/progress_tracker.txt")) {
         SCOPED_TRACE(c.where);
         CProgressData record;
-        pextool::ProgressTracker tracker;
-        const std::vector<Event> events = Parse(c[1]);
-        const std::vector<std::string> shown = Replay(record, tracker, events);
+        pextool::ProgressTracker tracker, late;
+        const std::vector<std::string> events = Parse(c[1]);
+        if (c[0] == "again" || c[0] == "late") Replay(record, tracker, events);  // a run before, in the process
+        const std::vector<std::string> shown = Replay(record, c[0] == "late" ? late : tracker, events);
         std::string out;
         for (std::size_t i = 0; i < events.size(); ++i)
-            if (c[0] == "every" || (events[i].kind == Event::Status && events[i].text == "Finished."))
+            if (c[0] == "every" || c[0] == "late" || events[i] == "F")
                 out += (out.empty() ? "" : ", ") + shown[i];
         EXPECT_EQ(out, c[2]);
     }
 }
 
-// The record is the process's own: a second UpdateAll in the same process starts from the steps
-// the first left, and a display started late sees them too.
-TEST(ProgressTracker, StepsLeftByEarlierRunsInTheProcessDoNotCount) {
-    CProgressData record;
-    pextool::ProgressTracker first;
-    const std::vector<Event> run = Parse("T2 I P1x3 I P1x2");
-    Replay(record, first, run);
-    EXPECT_EQ(Replay(record, first, run).back(), "2/2 2 of 2");
-    pextool::ProgressTracker late;
-    const std::vector<std::string> shown = Replay(record, late, run);
-    EXPECT_EQ(shown[1], "0/0 1 of 2");
-    EXPECT_EQ(shown.back(), "2/2 2 of 2");
+// A long status text is cut to the record's 255 characters.
+TEST(ProgressTracker, StatusTextIsCutTo255Characters) {
+    CProgressData progress;
+    EXPECT_FALSE(progress.StatusTextSet);
+    progress.SetStatusText(std::string(300, 'x'));
+    EXPECT_EQ(std::string(progress.StatusText), std::string(255, 'x'));
+    EXPECT_TRUE(progress.StatusTextSet);
 }
 
 }  // namespace
