@@ -34,11 +34,10 @@ std::vector<std::string> ColumnsOf(const std::vector<ContentRow>& rows) {
 
 }  // namespace
 
-void PipelineTest::Publish(const std::vector<ContentRow>& rows, const std::string& mode, const std::string& product,
-                           const std::string& content) {
+void PipelineTest::Publish(const std::vector<ContentRow>& rows, const std::string& product, const std::string& content) {
     const std::string section = "Software\\Vantric\\Pex\\" + product;
     SetRegText(reg::kLocalMachine, section, "ContentFileName", content);
-    SetRegText(reg::kLocalMachine, section, "ContentFileMode", mode);
+    SetRegText(reg::kLocalMachine, section, "ContentFileMode", "");
     SetRegText(reg::kLocalMachine, section, "ContentFileTarget", "");
     const std::vector<std::string> columns = ColumnsOf(rows);
     std::string text = Join(columns);
@@ -83,11 +82,6 @@ bool PipelineTest::ContentEntriesPresent() const {
 
 std::string PipelineTest::Installed(const std::string& fileName) const {
     return machine.ReadFile(std::string(kHome) + "\\" + fileName);
-}
-
-int PipelineTest::Count(const std::string& line) const {
-    const auto lines = trace.Lines();
-    return static_cast<int>(std::count(lines.begin(), lines.end(), line));
 }
 
 }  // namespace pextest

@@ -22,10 +22,10 @@ protected:
     static constexpr const char* kContent = "C:\\Pex\\Zendor32_content.txt";
     static constexpr const char* kHome = "C:\\App";
 
-    // Registers the product with its content file and mode; writes the content file, with a
+    // Registers the product with its content file (mode empty); writes the content file, with a
     // column for every cell name that some row has.
-    void Publish(const std::vector<ContentRow>& rows, const std::string& mode = "",
-                 const std::string& product = kProduct, const std::string& content = kContent);
+    void Publish(const std::vector<ContentRow>& rows, const std::string& product = kProduct,
+                 const std::string& content = kContent);
     // A row installing fileName from a download of bytes (C:\Pex\cache\<fileName>.new), in
     // status Downloaded.
     ContentRow Row(const std::string& fileName, const std::string& bytes, const std::string& group = "",
@@ -36,8 +36,6 @@ protected:
     bool ContentEntriesPresent() const;
 
     std::string Installed(const std::string& fileName) const;  // bytes at C:\App\fileName
-    // How many lines equal the text.
-    int Count(const std::string& line) const;
 
     TestMachine machine;
     TraceCapture trace;
