@@ -13,7 +13,8 @@
 
 namespace pextest {
 
-// One row of the content file: column name -> cell. Missing cells are empty.
+// One row of the content file: column name -> cell. Missing cells are empty; only the usual
+// columns are written.
 using ContentRow = std::map<std::string, std::string>;
 
 class PipelineTest : public ::testing::Test {
@@ -22,8 +23,8 @@ protected:
     static constexpr const char* kContent = "C:\\Pex\\Zendor32_content.txt";
     static constexpr const char* kHome = "C:\\App";
 
-    // Registers the product with its content file (mode empty); writes the content file, with a
-    // column for every cell name that some row has.
+    // Registers the product with its content file (mode empty); writes the content file with the
+    // usual columns.
     void Publish(const std::vector<ContentRow>& rows, const std::string& product = kProduct,
                  const std::string& content = kContent);
     // A row installing fileName from a download of bytes (C:\Pex\cache\<fileName>.new), in
