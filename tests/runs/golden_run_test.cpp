@@ -17,10 +17,6 @@
 #include <vector>
 
 #include "commands/platform_utilities.h"
-#include "diag/trace_log.h"
-#include "entry/library_startup.h"
-#include "entry/update_all.h"
-#include "manifest/manifest_parser.h"
 #include "platform/cfile.h"
 #include "platform/digest.h"
 #include "platform/fault.h"
@@ -94,9 +90,7 @@ int OpenHandles() {
 #ifdef _WIN32
     return 0;  // Wine's handle counts include its own; the Linux build checks this.
 #else
-    int count = 0;
-    for (auto it = fs::directory_iterator("/proc/self/fd"); it != fs::directory_iterator(); ++it) ++count;
-    return count;
+    return static_cast<int>(std::distance(fs::directory_iterator("/proc/self/fd"), fs::directory_iterator()));
 #endif
 }
 
