@@ -71,13 +71,7 @@ bool EndsWith(const std::string& text, const std::string& end) {
     return text.size() >= end.size() && text.compare(text.size() - end.size(), end.size(), end) == 0;
 }
 
-// "2020-01-02 03:04:05" <-> a file time.
-plat::files::FileTime ParseTime(const std::string& text) {
-    plat::OleDateTime date;
-    std::uint64_t time = 0;
-    if (!plat::ParseDateTime(text, &date) || !plat::ToFileTime(date, &time)) ADD_FAILURE() << text;
-    return time;
-}
+// A file time as "2020-01-02 03:04:05".
 std::string FormatTime(plat::files::FileTime time) {
     const std::time_t seconds = static_cast<std::time_t>(time / 10000000 - 11644473600ULL);
     char text[32];
@@ -131,8 +125,7 @@ public:
         const std::vector<std::string> temp = LeftInTemp();
         std::vector<std::unique_ptr<plat::CFile>> held;
         std::unique_ptr<golden::LockHolder> lock;
-        std::istringstream script(Slurp(folder_ / "scenario.txt"));
-        for (std::string line; std::getline(script, line);) {
+        for (const std::string& line : Lines(Slurp(folder_ / "scenario.txt"))) {
             const auto w = Words(line);
             if (w.empty() || w[0][0] == '#') continue;
             if (w[0] == "hold") held.push_back(Hold(line.substr(line.find(w[1]))));
@@ -174,14 +167,16 @@ private:
                 machine_->WriteFile(path, Slurp(e.path()));
             }
         // before.txt: "<path> [readonly] [written yyyy-mm-dd hh:mm:ss]" per line.
-        std::istringstream list(Slurp(folder_ / "before.txt"));
-        for (std::string line; std::getline(list, line);) {
+        for (const std::string& line : Lines(Slurp(folder_ / "before.txt"))) {
             const auto w = Words(line);
             if (w.empty() || w[0][0] == '#') continue;
             for (size_t i = 1; i < w.size(); ++i) {
                 if (w[i] == "written" && i + 2 < w.size()) {
-                    const auto t = ParseTime(w[i + 1] + " " + w[i + 2]);
-                    EXPECT_TRUE(plat::files::SetTimes(w[0], t, t, t)) << line;
+                    plat::OleDateTime date;
+                    std::uint64_t t = 0;
+                    EXPECT_TRUE(plat::ParseDateTime(w[i + 1] + " " + w[i + 2], &date) && plat::ToFileTime(date, &t) &&
+                                plat::files::SetTimes(w[0], t, t, t))
+                        << line;
                     i += 2;
                 } else if (w[i] == "readonly") {
                     EXPECT_TRUE(plat::files::SetAttributes(w[0], 1)) << line;
