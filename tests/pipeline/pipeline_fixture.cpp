@@ -1,7 +1,5 @@
 #include "tests/pipeline/pipeline_fixture.h"
 
-#include <algorithm>
-
 #include "tests/support/test_registry.h"
 
 namespace reg = plat::reg;
@@ -21,30 +19,17 @@ std::string Join(const std::vector<std::string>& cells) {
     return line + "\r\n";
 }
 
-// The usual columns, then the others that some row has, in name order.
-std::vector<std::string> ColumnsOf(const std::vector<ContentRow>& rows) {
-    std::vector<std::string> columns = kColumns;
-    for (const ContentRow& row : rows)
-        for (const auto& cell : row)
-            if (std::find(columns.begin(), columns.end(), cell.first) == columns.end())
-                columns.push_back(cell.first);
-    std::sort(columns.begin() + static_cast<std::ptrdiff_t>(kColumns.size()), columns.end());
-    return columns;
-}
-
 }  // namespace
 
-void PipelineTest::Publish(const std::vector<ContentRow>& rows, const std::string& mode, const std::string& product,
-                           const std::string& content) {
+void PipelineTest::Publish(const std::vector<ContentRow>& rows, const std::string& product, const std::string& content) {
     const std::string section = "Software\\Vantric\\Pex\\" + product;
     SetRegText(reg::kLocalMachine, section, "ContentFileName", content);
-    SetRegText(reg::kLocalMachine, section, "ContentFileMode", mode);
+    SetRegText(reg::kLocalMachine, section, "ContentFileMode", "");
     SetRegText(reg::kLocalMachine, section, "ContentFileTarget", "");
-    const std::vector<std::string> columns = ColumnsOf(rows);
-    std::string text = Join(columns);
+    std::string text = Join(kColumns);
     for (const ContentRow& row : rows) {
         std::vector<std::string> cells;
-        for (const std::string& column : columns) {
+        for (const std::string& column : kColumns) {
             auto it = row.find(column);
             cells.push_back(it == row.end() ? "" : it->second);
         }
@@ -83,11 +68,6 @@ bool PipelineTest::ContentEntriesPresent() const {
 
 std::string PipelineTest::Installed(const std::string& fileName) const {
     return machine.ReadFile(std::string(kHome) + "\\" + fileName);
-}
-
-int PipelineTest::Count(const std::string& line) const {
-    const auto lines = trace.Lines();
-    return static_cast<int>(std::count(lines.begin(), lines.end(), line));
 }
 
 }  // namespace pextest

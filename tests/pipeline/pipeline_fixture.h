@@ -13,7 +13,8 @@
 
 namespace pextest {
 
-// One row of the content file: column name -> cell. Missing cells are empty.
+// One row of the content file: column name -> cell. Missing cells are empty; only the usual
+// columns are written.
 using ContentRow = std::map<std::string, std::string>;
 
 class PipelineTest : public ::testing::Test {
@@ -22,10 +23,10 @@ protected:
     static constexpr const char* kContent = "C:\\Pex\\Zendor32_content.txt";
     static constexpr const char* kHome = "C:\\App";
 
-    // Registers the product with its content file and mode; writes the content file, with a
-    // column for every cell name that some row has.
-    void Publish(const std::vector<ContentRow>& rows, const std::string& mode = "",
-                 const std::string& product = kProduct, const std::string& content = kContent);
+    // Registers the product with its content file (mode empty); writes the content file with the
+    // usual columns.
+    void Publish(const std::vector<ContentRow>& rows, const std::string& product = kProduct,
+                 const std::string& content = kContent);
     // A row installing fileName from a download of bytes (C:\Pex\cache\<fileName>.new), in
     // status Downloaded.
     ContentRow Row(const std::string& fileName, const std::string& bytes, const std::string& group = "",
@@ -36,8 +37,6 @@ protected:
     bool ContentEntriesPresent() const;
 
     std::string Installed(const std::string& fileName) const;  // bytes at C:\App\fileName
-    // How many lines equal the text.
-    int Count(const std::string& line) const;
 
     TestMachine machine;
     TraceCapture trace;

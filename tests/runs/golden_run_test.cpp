@@ -17,10 +17,6 @@
 #include <vector>
 
 #include "commands/platform_utilities.h"
-#include "diag/trace_log.h"
-#include "entry/library_startup.h"
-#include "entry/update_all.h"
-#include "manifest/manifest_parser.h"
 #include "platform/cfile.h"
 #include "platform/digest.h"
 #include "platform/fault.h"
@@ -44,12 +40,7 @@ const char* const kModule = "C:\\Mendler\\Mendler.dll";
 const char* const kLogFolder = "C:\\Mendler\\log\\";
 const char* const kLog = "C:\\Mendler\\log\\pex_support_mendler.log";
 
-std::string Slurp(const fs::path& path) {
-    std::ifstream in(path, std::ios::binary);
-    std::ostringstream s;
-    s << in.rdbuf();
-    return s.str();
-}
+std::string Slurp(const fs::path& path) { return pextest::ReadHostFile(path.string()); }
 
 std::vector<std::string> Words(const std::string& line) {
     std::istringstream in(line);
@@ -65,6 +56,12 @@ std::vector<std::string> Lines(const std::string& text) {
     return out;
 }
 
+std::string Joined(const std::vector<std::string>& lines) {
+    std::string out;
+    for (const auto& l : lines) out += l + "\n";
+    return out;
+}
+
 // The text as a regular expression that matches it literally.
 std::string Escaped(const std::string& text) {
     return std::regex_replace(text, std::regex("[\\\\^$.|?*+()\\[\\]{}]"), "\\$&");
@@ -74,18 +71,7 @@ bool EndsWith(const std::string& text, const std::string& end) {
     return text.size() >= end.size() && text.compare(text.size() - end.size(), end.size(), end) == 0;
 }
 
-std::string Backslashed(std::string path) {
-    std::replace(path.begin(), path.end(), '/', '\\');
-    return path;
-}
-
-// "2020-01-02 03:04:05" <-> a file time.
-plat::files::FileTime ParseTime(const std::string& text) {
-    plat::OleDateTime date;
-    std::uint64_t time = 0;
-    if (!plat::ParseDateTime(text, &date) || !plat::ToFileTime(date, &time)) ADD_FAILURE() << text;
-    return time;
-}
+// A file time as "2020-01-02 03:04:05".
 std::string FormatTime(plat::files::FileTime time) {
     const std::time_t seconds = static_cast<std::time_t>(time / 10000000 - 11644473600ULL);
     char text[32];
@@ -98,9 +84,7 @@ int OpenHandles() {
 #ifdef _WIN32
     return 0;  // Wine's handle counts include its own; the Linux build checks this.
 #else
-    int count = 0;
-    for (auto it = fs::directory_iterator("/proc/self/fd"); it != fs::directory_iterator(); ++it) ++count;
-    return count;
+    return static_cast<int>(std::distance(fs::directory_iterator("/proc/self/fd"), fs::directory_iterator()));
 #endif
 }
 
@@ -141,8 +125,7 @@ public:
         const std::vector<std::string> temp = LeftInTemp();
         std::vector<std::unique_ptr<plat::CFile>> held;
         std::unique_ptr<golden::LockHolder> lock;
-        std::istringstream script(Slurp(folder_ / "scenario.txt"));
-        for (std::string line; std::getline(script, line);) {
+        for (const std::string& line : Lines(Slurp(folder_ / "scenario.txt"))) {
             const auto w = Words(line);
             if (w.empty() || w[0][0] == '#') continue;
             if (w[0] == "hold") held.push_back(Hold(line.substr(line.find(w[1]))));
@@ -179,18 +162,21 @@ private:
         if (fs::exists(before))
             for (const auto& e : fs::recursive_directory_iterator(before)) {
                 if (!e.is_regular_file()) continue;
-                const std::string rel = fs::relative(e.path(), before).generic_string();
-                machine_->WriteFile(Backslashed(rel.substr(0, 1) + ":/" + rel.substr(2)), Slurp(e.path()));
+                std::string path = fs::relative(e.path(), before).generic_string().insert(1, ":");
+                std::replace(path.begin(), path.end(), '/', '\\');
+                machine_->WriteFile(path, Slurp(e.path()));
             }
         // before.txt: "<path> [readonly] [written yyyy-mm-dd hh:mm:ss]" per line.
-        std::istringstream list(Slurp(folder_ / "before.txt"));
-        for (std::string line; std::getline(list, line);) {
+        for (const std::string& line : Lines(Slurp(folder_ / "before.txt"))) {
             const auto w = Words(line);
             if (w.empty() || w[0][0] == '#') continue;
             for (size_t i = 1; i < w.size(); ++i) {
                 if (w[i] == "written" && i + 2 < w.size()) {
-                    const auto t = ParseTime(w[i + 1] + " " + w[i + 2]);
-                    EXPECT_TRUE(plat::files::SetTimes(w[0], t, t, t)) << line;
+                    plat::OleDateTime date;
+                    std::uint64_t t = 0;
+                    EXPECT_TRUE(plat::ParseDateTime(w[i + 1] + " " + w[i + 2], &date) && plat::ToFileTime(date, &t) &&
+                                plat::files::SetTimes(w[0], t, t, t))
+                        << line;
                     i += 2;
                 } else if (w[i] == "readonly") {
                     EXPECT_TRUE(plat::files::SetAttributes(w[0], 1)) << line;
@@ -298,9 +284,7 @@ private:
         for (const std::string& top : Names("C:\\"))
             if (!std::binary_search(baseline_.begin(), baseline_.end(), top)) ListFiles("C:\\" + top, &lines);
         std::sort(lines.begin(), lines.end());
-        std::string out;
-        for (const auto& l : lines) out += l + "\n";
-        return Normalised(out, false);
+        return Normalised(Joined(lines), false);
     }
 
     void ListFiles(const std::string& path, std::vector<std::string>* lines) const {
@@ -339,24 +323,15 @@ private:
     // Wine enumerates a key's values in another order than they were written: the values of
     // each key are compared sorted by name.
     static std::string SortedValues(const std::string& text) {
-        std::istringstream in(text);
-        std::string out;
-        std::vector<std::string> values;
-        auto flush = [&] {
-            std::sort(values.begin(), values.end());
-            for (const auto& v : values) out += v + "\n";
-            values.clear();
-        };
-        for (std::string line; std::getline(in, line);) {
-            if (!line.empty() && line[0] == '"') {
-                values.push_back(line);
-                continue;
-            }
-            flush();
-            out += line + "\n";
+        std::vector<std::string> lines = Lines(text);
+        const auto isValue = [](const std::string& line) { return !line.empty() && line[0] == '"'; };
+        for (auto run = lines.begin(); run != lines.end();) {
+            run = std::find_if(run, lines.end(), isValue);
+            const auto end = std::find_if_not(run, lines.end(), isValue);
+            std::sort(run, end);
+            run = end;
         }
-        flush();
-        return out;
+        return Joined(lines);
     }
 
     // The temporary folder's files, but those that the restart queue moves (Wine stages the
@@ -387,13 +362,10 @@ private:
         const fs::path kept = folder_ / "expected" / "content";
         if (std::getenv("PEX_ACCEPT") && !pextest::UnderWine()) fs::remove_all(kept);
         std::vector<std::string> names;
-        std::istringstream list(Files());
-        for (std::string line; std::getline(list, line);) {
+        for (const std::string& line : Lines(Files())) {
             const std::string path = line.substr(0, line.find(' ', line.rfind('\\')));
             const std::string name = path.substr(path.rfind('\\') + 1);
-            std::string lower = name;
-            std::transform(lower.begin(), lower.end(), lower.begin(), ::tolower);
-            if (lower.find("content") == std::string::npos || EndsWith(name, "$jnl$")) continue;
+            if (!std::regex_search(name, std::regex("content", std::regex::icase)) || EndsWith(name, "$jnl$")) continue;
             std::string bytes;
             plat::files::ReadAll(path, &bytes);
             Compare("content/" + name, bytes);

@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <cctype>
 #include <fstream>
 
 namespace pextest {
@@ -20,13 +21,6 @@ std::vector<std::string> Fields(const std::string& line) {
         fields.push_back(Trim(line.substr(start, bar - start)));
     fields.push_back(Trim(line.substr(start)));
     return fields;
-}
-
-int HexDigit(char c) {
-    if (c >= '0' && c <= '9') return c - '0';
-    if (c >= 'a' && c <= 'f') return c - 'a' + 10;
-    if (c >= 'A' && c <= 'F') return c - 'A' + 10;
-    return -1;
 }
 
 }  // namespace
@@ -62,8 +56,9 @@ std::string Unescape(const std::string& field) {
         if (c == 'n') out += '\n';
         else if (c == 't') out += '\t';
         else if (c == 'r') out += '\r';
-        else if (c == 'x' && i + 2 < field.size() && HexDigit(field[i + 1]) >= 0 && HexDigit(field[i + 2]) >= 0) {
-            out += static_cast<char>(HexDigit(field[i + 1]) * 16 + HexDigit(field[i + 2]));
+        else if (c == 'x' && i + 2 < field.size() && std::isxdigit(static_cast<unsigned char>(field[i + 1])) &&
+                 std::isxdigit(static_cast<unsigned char>(field[i + 2]))) {
+            out += static_cast<char>(std::stoi(field.substr(i + 1, 2), nullptr, 16));
             i += 2;
         } else {
             out += c;  // \\ and any other escaped character stand for themselves

@@ -7,16 +7,6 @@
 
 namespace pextest {
 
-namespace {
-
-// The line without a leading "yyyy/mm/dd - hh:mm:ss.mmm - " stamp; unchanged when it has none.
-std::string StripTraceStamp(const std::string& line) {
-    static const std::regex stamp(R"(^\d{4}/\d{2}/\d{2} - \d{2}:\d{2}:\d{2}\.\d{3} - )");
-    return std::regex_replace(line, stamp, "", std::regex_constants::format_first_only);
-}
-
-}  // namespace
-
 TraceCapture::TraceCapture(const std::string& winPath, TraceLog& log) : path_(winPath), log_(log) {
     log_.Close();
     log_.enabled = log_.timestamps = log_.ensureNewline = true;
@@ -59,11 +49,14 @@ void TraceCapture::Clear() {
 }
 
 std::vector<std::string> TraceLines(const std::string& bytes) {
+    // A leading "yyyy/mm/dd - hh:mm:ss.mmm - " stamp goes; a line without one stays as it is.
+    static const std::regex stamp(R"(^\d{4}/\d{2}/\d{2} - \d{2}:\d{2}:\d{2}\.\d{3} - )");
     std::vector<std::string> lines;
     std::size_t start = 0;
     for (std::size_t lf; (lf = bytes.find('\n', start)) != std::string::npos; start = lf + 1) {
         std::size_t end = lf > start && bytes[lf - 1] == '\r' ? lf - 1 : lf;
-        lines.push_back(StripTraceStamp(bytes.substr(start, end - start)));
+        lines.push_back(std::regex_replace(bytes.substr(start, end - start), stamp, "",
+                                           std::regex_constants::format_first_only));
     }
     return lines;
 }
