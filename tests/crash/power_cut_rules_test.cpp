@@ -19,15 +19,18 @@
 #include "platform/power_cut.h"
 #include "platform/setup_install.h"
 #include "tests/crash/child_run.h"
-#include "tests/support/machine_files.h"
+#include "tests/support/case_file.h"
 #include "tests/support/test_machine.h"
 
 namespace {
 
 namespace files = plat::files;
 
-// The files of each scenario before and after its cut.
+// The files of each scenario before and after its cut: lines of "scenario | before or after |
+// Windows path | bytes" (through Unescape; "(empty)" is a file without bytes, "(missing)" none).
 constexpr char kCases[] = "crash/cases/power_cut_rules.txt";
+
+std::string Bytes(const std::string& field) { return field == "(empty)" ? "" : pextest::Unescape(field); }
 
 class PowerCutRules : public ::testing::Test {
 protected:
@@ -54,11 +57,23 @@ protected:
 
     std::string Host(const std::string& winPath) const { return plat::paths::ToHost(winPath); }
 
+    void PlaceFiles(const std::string& scenario) const {
+        for (const pextest::Case& c : pextest::ReadCases(kCases))
+            if (c[0] == scenario && c[1] == "before") machine.WriteFile(c[2], Bytes(c[3]));
+    }
+    void ExpectFiles(const std::string& scenario) const {
+        for (const pextest::Case& c : pextest::ReadCases(kCases)) {
+            if (c[0] != scenario || c[1] != "after") continue;
+            SCOPED_TRACE(c.where);
+            EXPECT_EQ(files::Exists(c[2]) ? machine.ReadFile(c[2]) : "(missing)", c[3] == "(missing)" ? c[3] : Bytes(c[3]));
+        }
+    }
+
     pextest::TestMachine machine;
 };
 
 TEST_F(PowerCutRules, BytesSurviveTheirFlushAndNamesTheirFolderFlush) {
-    pextest::PlaceFiles(machine, kCases, "flushes");
+    PlaceFiles("flushes");
     ASSERT_TRUE(CutAfter([&] {
         Write("C:\\d\\unflushed.txt", "new", plat::CFile::modeNoTruncate, false);
         Write("C:\\d\\flushed.txt", "new", plat::CFile::modeNoTruncate, true);
@@ -72,11 +87,11 @@ TEST_F(PowerCutRules, BytesSurviveTheirFlushAndNamesTheirFolderFlush) {
         plat::power::FolderFlushed(Host("C:\\f"));  // not the other folder
         close(empty);
     }));
-    pextest::ExpectFiles(machine, kCases, "flushes");
+    ExpectFiles("flushes");
 }
 
 TEST_F(PowerCutRules, WhatThePlatformReportsDoneSurvivesACut) {
-    pextest::PlaceFiles(machine, kCases, "reported");
+    PlaceFiles("reported");
     ASSERT_TRUE(CutAfter([] {
         // First, so that its folder flush (which it always made) covers none of the others.
         files::CopyToKeep("C:\\d\\source.txt", "C:\\d\\kept.txt");
@@ -91,11 +106,11 @@ TEST_F(PowerCutRules, WhatThePlatformReportsDoneSurvivesACut) {
         files::Copy("C:\\d\\source.txt", "C:\\d\\sub\\copy.txt", false);
         Write("C:\\d\\created.txt", "created", plat::CFile::modeCreate, true);
     }));
-    pextest::ExpectFiles(machine, kCases, "reported");
+    ExpectFiles("reported");
 }
 
 TEST_F(PowerCutRules, ABatchMakesItsCopiesAndDeletionsDurableWhenItEnds) {
-    pextest::PlaceFiles(machine, kCases, "batch");
+    PlaceFiles("batch");
     ASSERT_TRUE(CutAfter([] {
         {
             files::FolderFlushBatch ended;
@@ -107,11 +122,11 @@ TEST_F(PowerCutRules, ABatchMakesItsCopiesAndDeletionsDurableWhenItEnds) {
         files::Copy("C:\\d\\source.txt", "C:\\f\\pending.txt", false);
         files::Remove("C:\\f\\gone.txt");
     }));
-    pextest::ExpectFiles(machine, kCases, "batch");
+    ExpectFiles("batch");
 }
 
 TEST_F(PowerCutRules, AFileStagedForTheRestartSurvivesWithTheQueue) {
-    pextest::PlaceFiles(machine, kCases, "restart");
+    PlaceFiles("restart");
     ASSERT_TRUE(CutAfter([] {
         plat::CFile holder;  // the target in use
         holder.Open("C:\\d\\busy.dll", plat::CFile::modeRead | plat::CFile::shareExclusive);
