@@ -261,7 +261,8 @@ private:
         KeepLog(line);  // `all` and `product` run the library, which writes its log
     }
 
-    // Time stamps, the build's own folder and temporary names differ from machine to machine.
+    // Time stamps, the build's own folder and temporary names differ from machine to machine
+    // (Wine's setup service stages a file in use as SET<hex>.tmp, with one to four digits).
     std::string Normalised(const std::string& text, bool log) const {
         std::string out = log ? std::regex_replace(text, std::regex("(^|\n)\\d{4}/\\d\\d/\\d\\d - [0-9:.]{12} - "),
                                                    "$1")
@@ -275,7 +276,7 @@ private:
         // with the suite's version; the Linux build's host program is "pexupdate".
         out = std::regex_replace(out, std::regex("(\\[<bin>\\\\pexupdate\\.exe\\]: ).*"), "$1(the build's own)");
         out = std::regex_replace(out, std::regex(Escaped(plat::files::TempFolder()), std::regex::icase), "<temp>\\");
-        return std::regex_replace(out, std::regex("\\b[A-Za-z$~]{0,3}[0-9A-Fa-f]{4}\\.tmp\\b"), "<unique>.tmp");
+        return std::regex_replace(out, std::regex("\\b(SET[0-9A-Fa-f]{1,4}|[A-Za-z$~]{0,3}[0-9A-Fa-f]{4})\\.tmp\\b"), "<unique>.tmp");
     }
 
     // Every file on drive C: below the folders that a fresh machine does not have.
