@@ -41,4 +41,3 @@ target_compile_definitions(platform_version_info_test PRIVATE
   PEX_VERSION_TEXT="${PEX_VERSION_MAJOR}.${PEX_VERSION_MINOR}.${PEX_VERSION_BUILD}.${PEX_VERSION_REVISION}")
 
 pex_add_test(platform_setup_install_test SOURCES platform/setup_install_test.cpp)
-add_dependencies(platform_setup_install_test pexupdate)

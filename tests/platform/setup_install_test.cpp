@@ -1,6 +1,6 @@
 // Install at restart: a target in use (another opener holds it without sharing) is
-// staged beside itself and queued in PendingFileRenameOperations in Windows' own layout;
-// `pexupdate boot` carries the queue out.
+// staged beside itself and queued in PendingFileRenameOperations in Windows' own layout.
+// `pexupdate boot` carrying the queue out is the golden run pexupdate_boot.
 #include "platform/setup_install.h"
 
 #include <gtest/gtest.h>
@@ -12,7 +12,6 @@
 #include "platform/errors.h"
 #include "platform/files.h"
 #include "platform/paths.h"
-#include "platform/process.h"
 #include "platform/registry.h"
 #include "tests/support/test_machine.h"
 #include "tests/support/test_registry.h"
@@ -32,34 +31,6 @@ std::string StoredQueue(std::uint32_t* type) {
     std::string bytes;
     return pextest::GetRegValue(plat::reg::kLocalMachine, plat::setup::kSessionManagerKey,
                                 plat::setup::kPendingRenamesValue, &bytes, type) ? bytes : "<none>";
-}
-
-long Boot() {
-    plat::proc::Process p;
-    if (!plat::proc::Start("pexupdate boot", "", &p)) return -1;
-    plat::proc::Wait(p, plat::proc::kInfinite);
-    std::uint32_t code = 0;
-    plat::proc::ExitCode(p, &code);
-    return static_cast<long>(code);
-}
-
-TEST(SetupInstall, FailedRenameStaysQueuedAndNothingElseIsLost) {
-    pextest::TestMachine m;
-    m.WriteFile("C:\\app\\gone.tmp", "");
-    m.WriteFile("C:\\app\\staged.tmp", "new b");
-    m.WriteFile("C:\\app\\a.dll", "old a");
-    m.WriteFile("C:\\app\\b.dll", "old b");
-    ASSERT_TRUE(plat::files::Remove("C:\\app\\gone.tmp"));
-    ASSERT_EQ(plat::setup::QueuePendingRename({"C:\\app\\gone.tmp", "C:\\app\\a.dll", true}), 0);
-    ASSERT_EQ(plat::setup::QueuePendingRename({"C:\\app\\staged.tmp", "C:\\app\\b.dll", true}), 0);
-
-    EXPECT_EQ(Boot(), 1);
-    EXPECT_EQ(m.ReadFile("C:\\app\\a.dll"), "old a");
-    EXPECT_EQ(m.ReadFile("C:\\app\\b.dll"), "new b");
-    EXPECT_FALSE(plat::files::Exists("C:\\app\\staged.tmp"));
-    std::uint32_t type = 0;
-    EXPECT_EQ(StoredQueue(&type), "\\??\\C:\\app\\gone.tmp\0!\\??\\C:\\app\\a.dll\0\0"s);
-    EXPECT_EQ(type, plat::reg::kRegMultiSz);
 }
 
 // A free target is installed at once and nothing is queued; failures give the Windows codes.
