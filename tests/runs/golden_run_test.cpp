@@ -27,6 +27,7 @@
 #include "platform/reg_file.h"
 #include "platform/setup_install.h"
 #include "tests/runs/golden_child.h"
+#include "tests/support/environment.h"
 #include "tests/support/platform_guard.h"
 #include "tests/support/run_pexupdate.h"
 #include "tests/support/test_machine.h"
@@ -108,10 +109,6 @@ public:
     explicit GoldenRun(fs::path folder) : folder_(std::move(folder)) {}
 
     void TestBody() override {
-#ifdef _WIN32
-        if (Slurp(folder_ / "scenario.txt").find("\npexupdate ") != std::string::npos)
-            GTEST_SKIP() << "the host program's commands are given to a POSIX shell";
-#endif
         if (!golden::IsScenarioProcess()) {
             const std::string name = "golden." + folder_.filename().string();
             EXPECT_EQ(golden::RunScenarioAlone(name), 0) << name << " failed in its own process (its output is above)";
@@ -242,7 +239,7 @@ private:
     // runs from a copy beside the library's module, so that it reads the trace log of the runs.
     void Pexupdate(const std::string& line) {
         if (handles_ < 0) handles_ = OpenHandles();
-        const std::string program = "C:\\Mendler\\pexupdate";
+        const std::string program = "C:\\Mendler\\" + pextest::ProgramFile("pexupdate");
         if (!plat::files::Exists(program)) {
             PlaceModule("Mendler.dll", kModule);
             fs::copy_file(PEXUPDATE_PATH, plat::paths::ToHost(program));
@@ -272,9 +269,10 @@ private:
         const std::string bin = Escaped(binFolder_);
         out = std::regex_replace(out, std::regex("\\[ *" + bin, std::regex::icase), "[<bin>\\");
         out = std::regex_replace(out, std::regex(bin, std::regex::icase), "<bin>\\");
-        // The banner looks for pexupdate.exe beside the library: the Windows build has it, stamped
-        // with the suite's version; the Linux build's host program is "pexupdate".
-        out = std::regex_replace(out, std::regex("(\\[<bin>\\\\pexupdate\\.exe\\]: ).*"), "$1(the build's own)");
+        // The banner looks for pexupdate.exe beside the library (the build's and a scenario's
+        // copy): the Windows build's is stamped with the suite's version; the Linux build's host
+        // program is "pexupdate".
+        out = std::regex_replace(out, std::regex("(\\\\pexupdate\\.exe\\]: ).*"), "$1(the build's own)");
         out = std::regex_replace(out, std::regex(Escaped(plat::files::TempFolder()), std::regex::icase), "<temp>\\");
         return std::regex_replace(out, std::regex("\\b(SET[0-9A-Fa-f]{1,4}|[A-Za-z$~]{0,3}[0-9A-Fa-f]{4})\\.tmp\\b"), "<unique>.tmp");
     }
