@@ -64,11 +64,6 @@ Bytes Compress(const Bytes& original, std::uint32_t maxChunk) {
     return sink.data;
 }
 
-std::string CompressText(const std::string& original) {
-    const Bytes packed = Compress(Bytes(original.begin(), original.end()));
-    return std::string(packed.begin(), packed.end());
-}
-
 std::int32_t Expand(const Bytes& szdd, Bytes* expanded, std::uint32_t maxChunk) {
     MemorySource source(szdd, maxChunk);
     MemorySink sink;

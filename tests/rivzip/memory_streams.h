@@ -45,8 +45,6 @@ void ExpectWellFormedReports(std::uint32_t total, std::uint32_t finalProcessed, 
 // Codec calls over memory; Compress expects success.
 Bytes Compress(const Bytes& original, std::uint32_t maxChunk = UINT32_MAX);
 std::int32_t Expand(const Bytes& szdd, Bytes* expanded, std::uint32_t maxChunk = UINT32_MAX);
-// Compress for text, as the product tests publish their downloads.
-std::string CompressText(const std::string& original);
 // An SZDD header declaring the given length, followed by raw LZSS data.
 Bytes Szdd(std::uint32_t declaredLength, const Bytes& data);
 
